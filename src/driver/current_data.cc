@@ -1,0 +1,3 @@
+#include "driver/current_data.h"
+
+void select_current_data() {}

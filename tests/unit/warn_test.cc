@@ -1,0 +1,38 @@
+#include "fs/warn.h"
+
+#include <cerrno>
+
+#include "captured_stderr.h"
+#include "gtest/gtest.h"
+
+TEST(warn, writes_name_message_and_errno_text) {
+  captured_stderr err;
+  errno = ENOENT;
+  warn("Bad zoneinfo link %s", "/x");
+  EXPECT_EQ(err.text(),
+            "kestrel: Bad zoneinfo link /x: No such file or directory\n");
+}
+
+TEST(warn, uses_whatever_errno_holds) {
+  captured_stderr err;
+  errno = 0;
+  warn("Symlink points at data incompatible with installed system");
+  EXPECT_EQ(err.text(),
+            "kestrel: Symlink points at data incompatible with installed "
+            "system: Success\n");
+}
+
+TEST(warn, leaves_errno_as_it_was) {
+  captured_stderr err;
+  errno = EEXIST;
+  warn("message");
+  EXPECT_EQ(errno, EEXIST);
+}
+
+TEST(warn, prints_an_empty_argument_as_nothing) {
+  captured_stderr err;
+  errno = ENOENT;
+  warn("Bad zoneinfo link %s", "");
+  EXPECT_EQ(err.text(),
+            "kestrel: Bad zoneinfo link : No such file or directory\n");
+}
