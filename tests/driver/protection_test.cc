@@ -1,0 +1,41 @@
+#include "driver/protection.h"
+
+#include "captured_stderr.h"
+#include "gtest/gtest.h"
+#include "tree.h"
+
+namespace {
+
+class protect_data_directories_test : public testing::Test {
+ protected:
+  void SetUp() override { tree::clear("/var"); }
+};
+
+}  // namespace
+
+TEST_F(protect_data_directories_test,
+       missing_directories_stay_missing_silently) {
+  tree::make_dir("/var/db");
+  captured_stderr err;
+  protect_data_directories();
+  EXPECT_EQ(err.text(), "");
+  EXPECT_FALSE(tree::present("/var/db/timezone"));
+}
+
+TEST_F(protect_data_directories_test, missing_staged_directory_stays_missing) {
+  tree::make_dir("/var/db/timezone");
+  captured_stderr err;
+  protect_data_directories();
+  EXPECT_EQ(err.text(), "");
+  EXPECT_FALSE(tree::present("/var/db/timezone/tz"));
+}
+
+TEST_F(protect_data_directories_test,
+       existing_directories_are_left_as_they_are) {
+  tree::make_dir("/var/db/timezone/tz", 0700);
+  tree::write_file("/var/db/timezone/tz/kept", "data");
+  captured_stderr err;
+  protect_data_directories();
+  EXPECT_EQ(err.text(), "");
+  EXPECT_EQ(tree::file_content("/var/db/timezone/tz/kept"), "data");
+}
