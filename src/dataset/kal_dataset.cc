@@ -2,6 +2,7 @@
 
 #include <cstddef>
 #include <stdexcept>
+#include <string_view>
 
 #include "dataset/kal_icu.h"
 #include "dataset/kal_zoneinfo.h"
@@ -14,12 +15,13 @@ namespace {
 // counts as minor 1, subminor 0 of that release.
 constexpr char kSystemVersionSuffix[] = ".1.0";
 
-// A staged data set lies directly in the staged directory, named by its
-// version string.
+// A staged data set lies in the staged directory, named by its version
+// string. Only the prefix is checked: a deeper path or a trailing slash is
+// left for the version parse to refuse.
+constexpr std::string_view kStagedPrefix = paths::kStagedDir;
+
 bool is_staged_path(const std::string& path) {
-  const std::string prefix = paths::kStagedDir;
-  return path.size() > prefix.size() &&
-         path.compare(0, prefix.size(), prefix) == 0;
+  return path.size() > kStagedPrefix.size() && path.starts_with(kStagedPrefix);
 }
 
 }  // namespace
@@ -66,7 +68,7 @@ void kal_dataset::create_components() {
   if (path.empty()) {
     version_string = zoneinfo->version() + kSystemVersionSuffix;
   } else if (is_staged_path(path)) {
-    version_string = path.substr(std::string(paths::kStagedDir).size());
+    version_string = path.substr(kStagedPrefix.size());
   } else {
     warn("kal_dataset::create_components: bad path %s", path.c_str());
     throw std::invalid_argument("badpath");

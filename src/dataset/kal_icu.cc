@@ -25,6 +25,8 @@ std::string icu_path_of(const std::string& dataset_path) {
   return dataset_path + "/icutz";
 }
 
+// Whatever first word the system's format file holds; a missing, unreadable
+// or blank file leaves it empty, silently.
 std::string format_file_schema(const std::string& icu_path) {
   std::string schema;
   std::ifstream file(icu_path + "/" + kFormatFile);
@@ -46,6 +48,9 @@ std::string data_file_schema(const std::string& icu_path) {
   const std::regex data_file(R"(icutz([0-9]+[lbe])\.dat)");
   std::string root = icu_path;
   char* const roots[] = {root.data(), nullptr};
+  // A linked ICU directory is followed, but no link inside it, and the walk
+  // stays on the data set's file system. Without a comparison the directory's
+  // own order decides which data file wins.
   FTS* walk = fts_open(roots, FTS_COMFOLLOW | FTS_PHYSICAL | FTS_XDEV, nullptr);
   if (walk == nullptr) {
     warn("ka_icu::initialize: fts_open of %s failed, %s", icu_path.c_str(),

@@ -112,6 +112,7 @@ TEST(kal_version, number_beyond_32_bits_raises_and_keeps_earlier_fields) {
   } cases[] = {
       {"2147483648c.1.0", {7, "q", 8, 9}},
       {"2019c.99999999999.0", {2019, "c", 8, 9}},
+      {"2019c.4294967296.0", {2019, "c", 8, 9}},
       {"2019c.1.2147483648", {2019, "c", 1, 9}},
   };
   for (const auto& c : cases) {
