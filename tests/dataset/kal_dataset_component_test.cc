@@ -10,6 +10,7 @@
 #include "dataset/kal_icu.h"
 #include "dataset/kal_zoneinfo.h"
 #include "gtest/gtest.h"
+#include "outcome.h"
 #include "tree.h"
 
 namespace {

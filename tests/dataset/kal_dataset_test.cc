@@ -8,6 +8,7 @@
 #include "captured_stderr.h"
 #include "clean_device.h"
 #include "gtest/gtest.h"
+#include "outcome.h"
 #include "probe_component.h"
 #include "tree.h"
 

@@ -10,6 +10,7 @@
 #include "clean_device.h"
 #include "dataset/kal_zoneinfo.h"
 #include "gtest/gtest.h"
+#include "outcome.h"
 #include "probe_component.h"
 #include "tree.h"
 

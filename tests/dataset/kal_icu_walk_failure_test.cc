@@ -12,6 +12,7 @@
 #include "dataset/kal_dataset.h"
 #include "dataset/kal_icu.h"
 #include "gtest/gtest.h"
+#include "outcome.h"
 #include "tree.h"
 
 namespace {

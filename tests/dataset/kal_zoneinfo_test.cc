@@ -8,6 +8,7 @@
 #include "clean_device.h"
 #include "dataset/kal_icu.h"
 #include "gtest/gtest.h"
+#include "outcome.h"
 #include "probe_component.h"
 #include "tree.h"
 

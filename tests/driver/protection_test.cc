@@ -1,21 +1,19 @@
 #include "driver/protection.h"
 
 #include "captured_stderr.h"
+#include "clean_device.h"
 #include "gtest/gtest.h"
 #include "tree.h"
 
 namespace {
 
-class protect_data_directories_test : public testing::Test {
- protected:
-  void SetUp() override { tree::clear("/var"); }
-};
+class protect_data_directories_test : public clean_device {};
 
 }  // namespace
 
 TEST_F(protect_data_directories_test,
        missing_directories_stay_missing_silently) {
-  tree::make_dir("/var/db");
+  tree::clear("/var/db");
   captured_stderr err;
   protect_data_directories();
   EXPECT_EQ(err.text(), "");
@@ -23,7 +21,6 @@ TEST_F(protect_data_directories_test,
 }
 
 TEST_F(protect_data_directories_test, missing_staged_directory_stays_missing) {
-  tree::make_dir("/var/db/timezone");
   captured_stderr err;
   protect_data_directories();
   EXPECT_EQ(err.text(), "");

@@ -5,24 +5,9 @@
 
 #include "captured_stderr.h"
 #include "gtest/gtest.h"
+#include "outcome.h"
 #include "scratch_dir.h"
 #include "tree.h"
-
-namespace {
-
-// Runs call, which must raise an int, and returns that int.
-template <typename Call>
-int raised_by(Call call) {
-  try {
-    call();
-  } catch (int error) {
-    return error;
-  }
-  ADD_FAILURE() << "nothing was raised";
-  return 0;
-}
-
-}  // namespace
 
 TEST(remove, missing_path_is_silent_and_false) {
   scratch_dir dir;
