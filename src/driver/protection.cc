@@ -18,7 +18,7 @@ void set_protection_class(const char* path) {
     return;
   }
 #ifdef F_SETPROTECTIONCLASS
-  fcntl(fd, F_SETPROTECTIONCLASS, kProtectionClassD);
+  (void)fcntl(fd, F_SETPROTECTIONCLASS, kProtectionClassD);
 #endif
   // Where the platform has no protection classes every file is readable
   // without unlocking, which is what class D asks for: nothing to set.
