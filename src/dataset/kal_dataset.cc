@@ -15,14 +15,10 @@ namespace {
 // counts as minor 1, subminor 0 of that release.
 constexpr char kSystemVersionSuffix[] = ".1.0";
 
-// A staged data set lies in the staged directory, named by its version
-// string. Only the prefix is checked: a deeper path or a trailing slash is
-// left for the version parse to refuse.
+// A staged data set's version string is the rest of its path after the
+// staged directory. Only that prefix is checked: a deeper path or a trailing
+// slash stays in the text, for the version parse to refuse.
 constexpr std::string_view kStagedPrefix = paths::kStagedDir;
-
-bool is_staged_path(const std::string& path) {
-  return path.size() > kStagedPrefix.size() && path.starts_with(kStagedPrefix);
-}
 
 }  // namespace
 
@@ -67,7 +63,7 @@ void kal_dataset::create_components() {
   const std::shared_ptr<kal_zoneinfo> zoneinfo(new kal_zoneinfo(path));
   if (path.empty()) {
     version_string = zoneinfo->version() + kSystemVersionSuffix;
-  } else if (is_staged_path(path)) {
+  } else if (paths::is_staged(path)) {
     version_string = path.substr(kStagedPrefix.size());
   } else {
     warn("kal_dataset::create_components: bad path %s", path.c_str());

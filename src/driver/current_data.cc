@@ -13,6 +13,8 @@ namespace {
 
 constexpr std::string_view kStagedDir = paths::kStagedDir;
 
+// A link that cannot be read or mapped is reset to the system partition at
+// once, and the reconciliation goes on with the system's data.
 std::string designated_dataset_path() {
   try {
     return current_dataset_path();
@@ -74,8 +76,7 @@ std::string current_dataset_path() {
 }
 
 std::string dataset_path_from_link(const std::string& link_target) {
-  if (link_target.size() > kStagedDir.size() &&
-      link_target.starts_with(kStagedDir)) {
+  if (paths::is_staged(link_target)) {
     // The data-set directory is everything before the last "/", which must
     // come after at least one byte of the version string.
     const std::size_t last_slash = link_target.rfind('/');

@@ -1,6 +1,8 @@
 #ifndef KESTREL_FS_PATHS_H_
 #define KESTREL_FS_PATHS_H_
 
+#include <string_view>
+
 // The fixed places of the device's time-zone data. There is no configuration:
 // every reader on the device finds the data through these same links.
 namespace paths {
@@ -29,6 +31,13 @@ inline constexpr char kLegacyIcu[] = "/var/db/icu";
 // The system partition's own data.
 inline constexpr char kSystemZoneinfo[] = "/usr/share/zoneinfo.default";
 inline constexpr char kSystemIcu[] = "/usr/share/icu";
+
+// Whether path names something inside the staged directory: its prefix and
+// at least one byte more. Nothing else about the path is checked.
+inline bool is_staged(std::string_view path) {
+  return path.size() > std::string_view(kStagedDir).size() &&
+         path.starts_with(kStagedDir);
+}
 
 }  // namespace paths
 
