@@ -2,7 +2,6 @@
 
 #include <cstddef>
 #include <stdexcept>
-#include <string_view>
 
 #include "dataset/kal_icu.h"
 #include "dataset/kal_zoneinfo.h"
@@ -14,11 +13,6 @@ namespace {
 // The system partition records only its release, such as 2019c; its data
 // counts as minor 1, subminor 0 of that release.
 constexpr char kSystemVersionSuffix[] = ".1.0";
-
-// A staged data set's version string is the rest of its path after the
-// staged directory. Only that prefix is checked: a deeper path or a trailing
-// slash stays in the text, for the version parse to refuse.
-constexpr std::string_view kStagedPrefix = paths::kStagedDir;
 
 }  // namespace
 
@@ -64,7 +58,9 @@ void kal_dataset::create_components() {
   if (path.empty()) {
     version_string = zoneinfo->version() + kSystemVersionSuffix;
   } else if (paths::is_staged(path)) {
-    version_string = path.substr(kStagedPrefix.size());
+    // The rest of the path is the version string. A deeper path or a
+    // trailing slash stays in the text, for the version parse to refuse.
+    version_string = path.substr(paths::kStagedPrefix.size());
   } else {
     warn("kal_dataset::create_components: bad path %s", path.c_str());
     throw std::invalid_argument("badpath");

@@ -72,7 +72,7 @@ std::string data_file_schema(const std::string& icu_path) {
 
 }  // namespace
 
-kal_icu::kal_icu() : icu_path(paths::kSystemIcu) { initialize(); }
+kal_icu::kal_icu() : kal_icu(std::string()) {}
 
 kal_icu::kal_icu(const std::string& dataset_path)
     : kal_dataset_component(dataset_path), icu_path(icu_path_of(dataset_path)) {

@@ -21,9 +21,7 @@ std::string zoneinfo_dir_of(const std::string& dataset_path) {
 
 }  // namespace
 
-kal_zoneinfo::kal_zoneinfo() : zoneinfo_dir(paths::kSystemZoneinfo) {
-  read_version();
-}
+kal_zoneinfo::kal_zoneinfo() : kal_zoneinfo(std::string()) {}
 
 kal_zoneinfo::kal_zoneinfo(const std::string& dataset_path)
     : kal_dataset_component(dataset_path),

@@ -1,7 +1,6 @@
 #include "driver/current_data.h"
 
 #include <fstream>
-#include <string_view>
 
 #include "dataset/kal_dataset.h"
 #include "driver/cleanup_marker.h"
@@ -10,8 +9,6 @@
 #include "fs/warn.h"
 
 namespace {
-
-constexpr std::string_view kStagedDir = paths::kStagedDir;
 
 // A link that cannot be read or mapped is reset to the system partition at
 // once, and the reconciliation goes on with the system's data.
@@ -80,7 +77,8 @@ std::string dataset_path_from_link(const std::string& link_target) {
     // The data-set directory is everything before the last "/", which must
     // come after at least one byte of the version string.
     const std::size_t last_slash = link_target.rfind('/');
-    if (last_slash != std::string::npos && last_slash > kStagedDir.size()) {
+    if (last_slash != std::string::npos &&
+        last_slash > paths::kStagedPrefix.size()) {
       return link_target.substr(0, last_slash);
     }
   } else if (link_target == paths::kSystemZoneinfo) {

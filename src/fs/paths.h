@@ -11,6 +11,8 @@ namespace paths {
 // the trailing slash under which they get their protection class.
 inline constexpr char kTimezoneDir[] = "/var/db/timezone/";
 inline constexpr char kStagedDir[] = "/var/db/timezone/tz/";
+// The same, for measuring and slicing paths inside it.
+inline constexpr std::string_view kStagedPrefix = kStagedDir;
 
 // The links every other program reads the data through.
 inline constexpr char kZoneinfoLink[] = "/var/db/timezone/zoneinfo";
@@ -35,8 +37,7 @@ inline constexpr char kSystemIcu[] = "/usr/share/icu";
 // Whether path names something inside the staged directory: its prefix and
 // at least one byte more. Nothing else about the path is checked.
 inline bool is_staged(std::string_view path) {
-  return path.size() > std::string_view(kStagedDir).size() &&
-         path.starts_with(kStagedDir);
+  return path.size() > kStagedPrefix.size() && path.starts_with(kStagedPrefix);
 }
 
 }  // namespace paths
