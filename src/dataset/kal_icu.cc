@@ -6,8 +6,8 @@
 #include <cerrno>
 #include <cstring>
 #include <fstream>
-#include <regex>
 
+#include "dataset/icu_data_file.h"
 #include "fs/fs.h"
 #include "fs/paths.h"
 #include "fs/warn.h"
@@ -45,7 +45,6 @@ bool may_hold_data(const FTSENT& entry) {
 // The schema in the name of the first data file the directory yields, such
 // as 57l from icutz57l.dat; empty when there is none.
 std::string data_file_schema(const std::string& icu_path) {
-  const std::regex data_file(R"(icutz([0-9]+[lbe])\.dat)");
   std::string root = icu_path;
   char* const roots[] = {root.data(), nullptr};
   // A linked ICU directory is followed, but no link inside it, and the walk
@@ -58,12 +57,10 @@ std::string data_file_schema(const std::string& icu_path) {
     throw errno;
   }
   std::string schema;
-  std::cmatch name;
   for (FTSENT* entry = fts_read(walk); entry != nullptr && schema.empty();
        entry = fts_read(walk)) {
-    if (may_hold_data(*entry) &&
-        std::regex_match(entry->fts_name, name, data_file)) {
-      schema = name[1].str();
+    if (may_hold_data(*entry)) {
+      schema = icu_data_file_schema(entry->fts_name).value_or("");
     }
   }
   (void)fts_close(walk);
