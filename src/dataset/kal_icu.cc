@@ -5,9 +5,9 @@
 
 #include <cerrno>
 #include <cstring>
-#include <fstream>
 
 #include "dataset/icu_data_file.h"
+#include "fs/first_word.h"
 #include "fs/fs.h"
 #include "fs/paths.h"
 #include "fs/warn.h"
@@ -28,10 +28,7 @@ std::string icu_path_of(const std::string& dataset_path) {
 // Whatever first word the system's format file holds; a missing, unreadable
 // or blank file leaves it empty, silently.
 std::string format_file_schema(const std::string& icu_path) {
-  std::string schema;
-  std::ifstream file(icu_path + "/" + kFormatFile);
-  file >> schema;
-  return schema;
+  return fs::read_first_word(icu_path + "/" + kFormatFile);
 }
 
 // Only a regular file lying directly in the ICU directory and readable by
