@@ -58,6 +58,12 @@ std::string data_file_schema(const std::string& icu_path) {
        entry = fts_read(walk)) {
     if (may_hold_data(*entry)) {
       schema = icu_data_file_schema(entry->fts_name).value_or("");
+    } else if (entry->fts_level == 1 && entry->fts_info == FTS_D) {
+      // Nothing below the ICU directory's own entries can qualify, so the
+      // walk never goes down. A skipped directory comes back once more, as
+      // FTS_DP, which never qualifies either: the entries met, their kinds,
+      // depths and order at depth 1 are those of a full walk.
+      (void)fts_set(walk, entry, FTS_SKIP);
     }
   }
   (void)fts_close(walk);
