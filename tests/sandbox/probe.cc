@@ -11,7 +11,8 @@
 #include <string>
 
 int main(int argc, char** argv) {
-  for (const char* path : {"/var/db/timezone", "/work", "/proc/self"}) {
+  for (const char* path : {"/var/db/timezone", "/usr/share/zoneinfo.default",
+                           "/work", "/proc/self"}) {
     std::fprintf(stderr, "%s %s\n", path,
                  access(path, F_OK) == 0 ? "seen" : "unseen");
   }
