@@ -22,6 +22,7 @@ import shlex
 import shutil
 import subprocess
 import tempfile
+import threading
 
 TOOLS = os.path.dirname(os.path.abspath(__file__))
 SANDBOX = os.path.join(TOOLS, "device-sandbox")
@@ -39,6 +40,15 @@ def _load_run_scenario():
 
 
 scenario = _load_run_scenario()
+
+# The scenario runner builds and reads trees by changing the working
+# directory, which all threads share: one tree at a time.
+_tree_lock = threading.Lock()
+
+
+def read_tree(device):
+    with _tree_lock:
+        return scenario.read_tree(device)
 
 # Representative device states: name, and the scenario whose "before:" tree
 # is that state.
@@ -98,7 +108,8 @@ def build_device(scratch, tree):
     device = os.path.join(scratch, "device")
     os.mkdir(device)
     os.umask(0o022)
-    scenario.build(device, tree)
+    with _tree_lock:
+        scenario.build(device, tree)
     return device
 
 
@@ -135,7 +146,7 @@ def run_kestrel(kestrel, device, strace_options=None):
         if strace_options is not None and os.path.exists(trace_file):
             with open(trace_file, encoding="latin-1") as lines:
                 trace = parse_trace(lines, device)
-        after = scenario.read_tree(device)
+        after = read_tree(device)
         return Run(process.returncode, err.decode("latin-1").splitlines(),
                    after, trace, timed_out)
     finally:
