@@ -134,7 +134,10 @@ def run_kestrel(kestrel, device, strace_options=None):
                                    stdin=subprocess.DEVNULL,
                                    stdout=subprocess.DEVNULL,
                                    stderr=subprocess.PIPE, env=env,
-                                   start_new_session=True)
+                                   start_new_session=True,
+                                   # Another thread may be inside a tree
+                                   # that is about to be removed.
+                                   cwd="/")
         timed_out = False
         try:
             _, err = process.communicate(timeout=TIMEOUT)
