@@ -43,25 +43,30 @@ def outcome(config):
             "rough_seconds": seconds}
 
 
-def runs_per_round(config, rough_seconds):
-    """The configured runs, fewer where one run is slow, so that a state
-    costs a bounded time; at least two, so that the median means something
-    together with the other rounds."""
-    affordable = int(config["seconds_per_round"] / max(rough_seconds, 1e-4))
-    return max(2, min(config["runs"], affordable))
+def rounds_and_runs(config, rough_seconds):
+    """The configured rounds and runs, fewer where one run is slow, so that
+    a state costs a bounded time: at least three rounds of two runs."""
+    wanted = config["rounds"] * config["runs"]
+    affordable = int(config["seconds_per_state"] / max(rough_seconds, 1e-4))
+    if affordable >= wanted:
+        return config["rounds"], config["runs"]
+    rounds = min(config["rounds"], max(3, affordable // 2))
+    return rounds, max(2, affordable // rounds)
 
 
-def wall_times(config, scratch, runs):
+def wall_times(config, scratch, rounds, runs, warmup):
     """Rounds of hyperfine, the two programs in alternating order, each run
-    after a restore; pooled over rounds, so slow phases of the shared
-    machine fall on both programs alike."""
+    after a restore. Every round gives a ratio of the two programs' medians,
+    measured moments apart, so that slow phases of the shared machine fall
+    on both alike; the times are also pooled over the rounds."""
     times = {"kestrel": [], "do_nothing": []}
-    for round_number in range(config["rounds"]):
+    round_ratios = []
+    for round_number in range(rounds):
         names = ["kestrel", "do_nothing"]
         if round_number % 2:
             names.reverse()
         export = os.path.join(scratch, f"round{round_number}.json")
-        command = ["hyperfine", "-N", "--style", "none", "--warmup", "2",
+        command = ["hyperfine", "-N", "--style", "none", "--warmup", str(warmup),
                    "--runs", str(runs), "--export-json", export,
                    "--prepare", config["restore"]]
         # Its advice about outliers would only repeat that the machine is
@@ -73,9 +78,12 @@ def wall_times(config, scratch, runs):
             sys.exit(done.stderr.decode("latin-1"))
         with open(export) as data:
             results = json.load(data)["results"]
+        medians = {}
         for name, result in zip(names, results):
             times[name].extend(result["times"])
-    return times
+            medians[name] = statistics.median(result["times"])
+        round_ratios.append(medians["kestrel"] / medians["do_nothing"])
+    return times, round_ratios
 
 
 def instructions(binary, config, repeats):
@@ -133,12 +141,16 @@ def main():
         config = json.load(data)
     with tempfile.TemporaryDirectory(prefix="kestrel-measure.") as scratch:
         result = {"outcome": outcome(config)}
-        runs = runs_per_round(config, result["outcome"]["rough_seconds"])
-        times = wall_times(config, scratch, runs)
+        rough = result["outcome"]["rough_seconds"]
+        rounds, runs = rounds_and_runs(config, rough)
+        times, round_ratios = wall_times(config, scratch, rounds, runs,
+                                         2 if rough < 0.02 else 1)
         result["wall_seconds"] = {
             name: {"median": statistics.median(values), "runs": len(values),
                    "min": min(values), "max": max(values)}
             for name, values in times.items()}
+        result["wall_round_ratios"] = round_ratios
+        result["wall_plan"] = {"rounds": rounds, "runs_per_round": runs}
         result["instructions"] = {
             "kestrel": instructions(config["kestrel"], config, 3),
             "do_nothing": instructions(config["do_nothing"], config, 1)}

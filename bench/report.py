@@ -25,7 +25,9 @@ def summarize(result, common=None):
     summary = {
         "kestrel_wall_us": wall["kestrel"]["median"] * 1e6,
         "do_nothing_wall_us": wall["do_nothing"]["median"] * 1e6,
-        "wall_ratio": wall["kestrel"]["median"] / wall["do_nothing"]["median"],
+        # The median of the rounds' ratios, each from the two programs run
+        # moments apart, not the ratio of the pooled medians.
+        "wall_ratio": statistics.median(result["wall_round_ratios"]),
         "instructions": int(statistics.median(
             result["instructions"]["kestrel"])),
         "do_nothing_instructions": result["instructions"]["do_nothing"][0],
@@ -70,11 +72,11 @@ def print_run(run):
           f"do-nothing: {binaries['do_nothing']['stripped_size']:,} stripped")
     header = ("state", "kestrel us", "nothing us", "ratio", "instructions",
               "nothing instr", "peak KiB", "syscalls", "nothing sysc")
-    print("\n{:<20}{:>11}{:>11}{:>7}{:>14}{:>14}{:>10}{:>10}{:>13}".format(
+    print("\n{:<20}{:>11}{:>11}{:>9}{:>14}{:>14}{:>10}{:>10}{:>13}".format(
         *header))
     for name, state in run["states"].items():
         s = state["summary"]
-        print("{:<20}{:>11.0f}{:>11.0f}{:>7.2f}{:>14,}{:>14,}{:>10,}{:>10,}"
+        print("{:<20}{:>11,.0f}{:>11,.0f}{:>9.2f}{:>14,}{:>14,}{:>10,}{:>10,}"
               "{:>13,}".format(name, s["kestrel_wall_us"],
                                s["do_nothing_wall_us"], s["wall_ratio"],
                                s["instructions"],
