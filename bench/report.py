@@ -28,6 +28,9 @@ def summarize(result, common=None):
         # The median of the rounds' ratios, each from the two programs run
         # moments apart, not the ratio of the pooled medians.
         "wall_ratio": statistics.median(result["wall_round_ratios"]),
+        # The fastest runs, less disturbed by the machine's other work.
+        "wall_ratio_of_minima": (wall["kestrel"]["min"] /
+                                 wall["do_nothing"]["min"]),
         "instructions": int(statistics.median(
             result["instructions"]["kestrel"])),
         "do_nothing_instructions": result["instructions"]["do_nothing"][0],
