@@ -73,19 +73,25 @@ def print_run(run):
     print(f"\nkestrel: {binaries['kestrel']['size']:,} bytes, "
           f"{binaries['kestrel']['stripped_size']:,} stripped; "
           f"do-nothing: {binaries['do_nothing']['stripped_size']:,} stripped")
-    header = ("state", "kestrel us", "nothing us", "ratio", "instructions",
-              "nothing instr", "peak KiB", "syscalls", "nothing sysc")
-    print("\n{:<20}{:>11}{:>11}{:>9}{:>14}{:>14}{:>10}{:>10}{:>13}".format(
-        *header))
+    header = ("state", "kestrel us", "nothing us", "ratio", "min ratio",
+              "instructions", "nothing instr", "peak KiB", "syscalls",
+              "nothing sysc")
+    print("\n{:<20}{:>11}{:>11}{:>9}{:>10}{:>14}{:>14}{:>10}{:>10}{:>13}"
+          .format(*header))
     for name, state in run["states"].items():
         s = state["summary"]
-        print("{:<20}{:>11,.0f}{:>11,.0f}{:>9.2f}{:>14,}{:>14,}{:>10,}{:>10,}"
-              "{:>13,}".format(name, s["kestrel_wall_us"],
+        print("{:<20}{:>11,.0f}{:>11,.0f}{:>9.2f}{:>10.2f}{:>14,}{:>14,}{:>10,}"
+              "{:>10,}{:>13,}".format(name, s["kestrel_wall_us"],
                                s["do_nothing_wall_us"], s["wall_ratio"],
+                               s["wall_ratio_of_minima"],
                                s["instructions"],
                                s["do_nothing_instructions"],
                                s["peak_rss_kib"], s["system_calls"],
                                s["do_nothing_system_calls"]))
+    print("\n(us: median wall time; ratio: median of the interleaved rounds'"
+          " ratios; min ratio: fastest run / fastest run)")
+    for name, state in run["states"].items():
+        print(f"  {name}: {state['description']}")
     print("\nin-process (Google Benchmark, ns per call):")
     for name, figures in run["microbenchmarks"].items():
         print(f"  {name:<32}{figures['real_time_ns']:>12.1f}")
@@ -96,7 +102,8 @@ def print_run(run):
               f"{'met' if verdict['met'] else 'MISSED'}")
 
 
-COMPARED = ("kestrel_wall_us", "wall_ratio", "instructions", "peak_rss_kib",
+COMPARED = ("kestrel_wall_us", "wall_ratio", "wall_ratio_of_minima",
+            "instructions", "peak_rss_kib",
             "system_calls")
 
 
