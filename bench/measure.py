@@ -100,18 +100,21 @@ def instructions(binary, config, repeats):
     return counts
 
 
-def peak_rss_kib(binary, config, repeats, scratch):
-    """Maximum resident set size, from GNU time's %M."""
+def memory(binary, config, repeats, scratch):
+    """Maximum resident set size in KiB and minor page faults, from GNU
+    time's %M and %R."""
     report = os.path.join(scratch, "time")
-    sizes = []
+    figures = {"peak_rss_kib": [], "minor_faults": []}
     for _ in range(repeats):
         restore(config)
-        subprocess.run(["/usr/bin/time", "-f", "%M", "-o", report, binary],
+        subprocess.run(["/usr/bin/time", "-f", "%M %R", "-o", report, binary],
                        stdin=subprocess.DEVNULL, stderr=subprocess.DEVNULL,
                        check=True)
         with open(report) as data:
-            sizes.append(int(data.read().split()[-1]))
-    return sizes
+            peak, faults = data.read().split()[-2:]
+        figures["peak_rss_kib"].append(int(peak))
+        figures["minor_faults"].append(int(faults))
+    return figures
 
 
 def system_calls(binary, config, scratch):
@@ -154,9 +157,11 @@ def main():
         result["instructions"] = {
             "kestrel": instructions(config["kestrel"], config, 3),
             "do_nothing": instructions(config["do_nothing"], config, 1)}
-        result["peak_rss_kib"] = {
-            name: peak_rss_kib(config[name], config, 3, scratch)
-            for name in ("kestrel", "do_nothing")}
+        memories = {name: memory(config[name], config, 3, scratch)
+                    for name in ("kestrel", "do_nothing")}
+        for figure in ("peak_rss_kib", "minor_faults"):
+            result[figure] = {name: memories[name][figure]
+                              for name in memories}
         result["system_calls"] = {
             name: system_calls(config[name], config, scratch)
             for name in ("kestrel", "do_nothing")}

@@ -38,6 +38,10 @@ def summarize(result, common=None):
             result["peak_rss_kib"]["kestrel"])),
         "do_nothing_peak_rss_kib": int(statistics.median(
             result["peak_rss_kib"]["do_nothing"])),
+        "minor_faults": int(statistics.median(
+            result.get("minor_faults", {}).get("kestrel", [0]))),
+        "do_nothing_minor_faults": int(statistics.median(
+            result.get("minor_faults", {}).get("do_nothing", [0]))),
         "system_calls": result["system_calls"]["kestrel"]["total"],
         "do_nothing_system_calls":
             result["system_calls"]["do_nothing"]["total"],
@@ -45,8 +49,10 @@ def summarize(result, common=None):
     if common is not None:
         summary["instructions_vs_common"] = (summary["instructions"] /
                                              common["instructions"])
-        summary["wall_vs_common"] = (summary["kestrel_wall_us"] /
-                                     common["kestrel_wall_us"])
+        # Each state's time against its own interleaved do-nothing runs,
+        # so that the machine's load while each state was measured cancels.
+        summary["wall_vs_common"] = (summary["wall_ratio"] /
+                                     common["wall_ratio"])
     return summary
 
 
@@ -74,22 +80,23 @@ def print_run(run):
           f"{binaries['kestrel']['stripped_size']:,} stripped; "
           f"do-nothing: {binaries['do_nothing']['stripped_size']:,} stripped")
     header = ("state", "kestrel us", "nothing us", "ratio", "min ratio",
-              "instructions", "nothing instr", "peak KiB", "syscalls",
-              "nothing sysc")
-    print("\n{:<20}{:>11}{:>11}{:>9}{:>10}{:>14}{:>14}{:>10}{:>10}{:>13}"
-          .format(*header))
+              "instructions", "nothing instr", "peak KiB", "faults",
+              "syscalls", "nothing sysc")
+    line = ("{:<20}{:>11}{:>11}{:>9}{:>10}{:>14}{:>14}{:>10}{:>8}{:>10}"
+            "{:>13}")
+    print("\n" + line.format(*header))
     for name, state in run["states"].items():
         s = state["summary"]
-        print("{:<20}{:>11,.0f}{:>11,.0f}{:>9.2f}{:>10.2f}{:>14,}{:>14,}{:>10,}"
-              "{:>10,}{:>13,}".format(name, s["kestrel_wall_us"],
-                               s["do_nothing_wall_us"], s["wall_ratio"],
-                               s["wall_ratio_of_minima"],
-                               s["instructions"],
-                               s["do_nothing_instructions"],
-                               s["peak_rss_kib"], s["system_calls"],
-                               s["do_nothing_system_calls"]))
+        print(line.format(
+            name, f"{s['kestrel_wall_us']:,.0f}",
+            f"{s['do_nothing_wall_us']:,.0f}", f"{s['wall_ratio']:.2f}",
+            f"{s['wall_ratio_of_minima']:.2f}", f"{s['instructions']:,}",
+            f"{s['do_nothing_instructions']:,}", f"{s['peak_rss_kib']:,}",
+            f"{s['minor_faults']:,}", f"{s['system_calls']:,}",
+            f"{s['do_nothing_system_calls']:,}"))
     print("\n(us: median wall time; ratio: median of the interleaved rounds'"
-          " ratios; min ratio: fastest run / fastest run)")
+          " ratios; min ratio: fastest run / fastest run; faults: minor page"
+          " faults)")
     for name, state in run["states"].items():
         print(f"  {name}: {state['description']}")
     print("\nin-process (Google Benchmark, ns per call):")
@@ -104,7 +111,7 @@ def print_run(run):
 
 COMPARED = ("kestrel_wall_us", "wall_ratio", "wall_ratio_of_minima",
             "instructions", "peak_rss_kib",
-            "system_calls")
+            "minor_faults", "system_calls")
 
 
 def print_comparison(old, new):
