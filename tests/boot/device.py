@@ -91,5 +91,5 @@ def read_local_time(root):
     for instant in INSTANTS:
         dates += reader("env", "TZ=:/var/db/timezone/localtime", "date",
                         "-d", "@" + instant, "+%Z%z")
-    zdump = reader("zdump", "-c", "2025,2026", "/var/db/timezone/localtime")
+    zdump = reader("zdump", "-v", "-c", "2025,2026", "/var/db/timezone/localtime")
     return dates, zdump

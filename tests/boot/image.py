@@ -18,9 +18,13 @@ def run(*command):
 
 
 def install_package(root, deb):
-    # dpkg runs the package's maintainer scripts changed root into the
-    # tree; no systemd runs there, so the unit is enabled but not started.
-    run("dpkg", "--root=" + root, "--force-not-root", "-i", deb)
+    # dpkg of the test system itself, changed root into it, so that users,
+    # groups and maintainer scripts are the system's own; no systemd runs
+    # there, so the unit is enabled but not started.
+    inside = "/tmp/" + os.path.basename(deb)
+    shutil.copy(deb, root + inside)
+    run("chroot", root, "dpkg", "-i", inside)
+    os.remove(root + inside)
 
 
 def lay_out_system_partition(root):
