@@ -5,9 +5,9 @@
 
 #include <cerrno>
 #include <cstring>
-#include <fstream>
-#include <regex>
 
+#include "dataset/icu_data_file.h"
+#include "fs/first_word.h"
 #include "fs/fs.h"
 #include "fs/paths.h"
 #include "fs/warn.h"
@@ -28,10 +28,7 @@ std::string icu_path_of(const std::string& dataset_path) {
 // Whatever first word the system's format file holds; a missing, unreadable
 // or blank file leaves it empty, silently.
 std::string format_file_schema(const std::string& icu_path) {
-  std::string schema;
-  std::ifstream file(icu_path + "/" + kFormatFile);
-  file >> schema;
-  return schema;
+  return fs::read_first_word(icu_path + "/" + kFormatFile);
 }
 
 // Only a regular file lying directly in the ICU directory and readable by
@@ -45,7 +42,6 @@ bool may_hold_data(const FTSENT& entry) {
 // The schema in the name of the first data file the directory yields, such
 // as 57l from icutz57l.dat; empty when there is none.
 std::string data_file_schema(const std::string& icu_path) {
-  const std::regex data_file(R"(icutz([0-9]+[lbe])\.dat)");
   std::string root = icu_path;
   char* const roots[] = {root.data(), nullptr};
   // A linked ICU directory is followed, but no link inside it, and the walk
@@ -58,12 +54,16 @@ std::string data_file_schema(const std::string& icu_path) {
     throw errno;
   }
   std::string schema;
-  std::cmatch name;
   for (FTSENT* entry = fts_read(walk); entry != nullptr && schema.empty();
        entry = fts_read(walk)) {
-    if (may_hold_data(*entry) &&
-        std::regex_match(entry->fts_name, name, data_file)) {
-      schema = name[1].str();
+    if (may_hold_data(*entry)) {
+      schema = icu_data_file_schema(entry->fts_name).value_or("");
+    } else if (entry->fts_level == 1 && entry->fts_info == FTS_D) {
+      // Nothing below the ICU directory's own entries can qualify, so the
+      // walk never goes down. A skipped directory comes back once more, as
+      // FTS_DP, which never qualifies either: the entries met, their kinds,
+      // depths and order at depth 1 are those of a full walk.
+      (void)fts_set(walk, entry, FTS_SKIP);
     }
   }
   (void)fts_close(walk);

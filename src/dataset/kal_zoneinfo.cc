@@ -1,7 +1,5 @@
 #include "dataset/kal_zoneinfo.h"
 
-#include <fstream>
-
 #include "fs/fs.h"
 #include "fs/paths.h"
 #include "fs/warn.h"
@@ -25,11 +23,10 @@ kal_zoneinfo::kal_zoneinfo() : kal_zoneinfo(std::string()) {}
 
 kal_zoneinfo::kal_zoneinfo(const std::string& dataset_path)
     : kal_dataset_component(dataset_path),
-      zoneinfo_dir(zoneinfo_dir_of(dataset_path)) {
-  read_version();
-}
+      zoneinfo_dir(zoneinfo_dir_of(dataset_path)),
+      version_file(zoneinfo_dir + "/" + kVersionFile) {}
 
-std::string kal_zoneinfo::version() const { return version_; }
+std::string kal_zoneinfo::version() const { return version_file.first_word(); }
 
 bool kal_zoneinfo::compatible_schema(
     const kal_dataset_component& /*other*/) const {
@@ -45,11 +42,4 @@ void kal_zoneinfo::make_current() const {
     warn("Unlink of zoneinfo softlink failed");
   }
   fs::create_symlink(zoneinfo_dir, paths::kZoneinfoLink);
-}
-
-void kal_zoneinfo::read_version() {
-  // A missing, unreadable or blank file leaves the version empty; the data
-  // set decides what that means.
-  std::ifstream file(zoneinfo_dir + "/" + kVersionFile);
-  file >> version_;
 }

@@ -1,6 +1,9 @@
 #include "driver/current_data.h"
 
-#include <fstream>
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <string_view>
 
 #include "dataset/kal_dataset.h"
 #include "driver/cleanup_marker.h"
@@ -9,6 +12,9 @@
 #include "fs/warn.h"
 
 namespace {
+
+// Readable and writable by all, less the process's umask.
+constexpr mode_t kRecordMode = 0666;
 
 // A link that cannot be read or mapped is reset to the system partition at
 // once, and the reconciliation goes on with the system's data.
@@ -23,10 +29,26 @@ std::string designated_dataset_path() {
 }
 
 // The data set that was current before an update and the update itself, as
-// "<old version string>_<new version string>", with no line end.
+// "<old version string>_<new version string>", with no line end. Created or
+// truncated as fopen's mode "w" does; a failure is neither tested nor
+// reported, and what could not be written stays unwritten.
 void write_version_record(const kal_dataset& before, const kal_dataset& now) {
-  std::ofstream record(paths::kVersionRecord, std::ios::trunc);
-  record << before.get_version_string() << '_' << now.get_version_string();
+  const std::string record =
+      before.get_version_string() + "_" + now.get_version_string();
+  const int fd = open(paths::kVersionRecord,
+                      O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, kRecordMode);
+  if (fd < 0) {
+    return;
+  }
+  std::string_view rest = record;
+  while (!rest.empty()) {
+    const ssize_t written = write(fd, rest.data(), rest.size());
+    if (written <= 0) {
+      break;
+    }
+    rest.remove_prefix(static_cast<std::size_t>(written));
+  }
+  (void)close(fd);
 }
 
 void reconcile() {

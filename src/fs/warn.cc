@@ -5,28 +5,45 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <string_view>
+
+namespace {
+
+// The line is put together in memory and written at once, so that it is
+// never interleaved with anything else on standard error.
+void write_line(std::string_view message, std::string_view error_text) {
+  const std::string_view parts[] = {"kestrel: ", message, ": ", error_text,
+                                    "\n"};
+  std::size_t length = 0;
+  for (const std::string_view part : parts) {
+    length += part.size();
+  }
+  char* const line = static_cast<char*>(std::malloc(length));
+  if (line == nullptr) {
+    return;
+  }
+  char* end = line;
+  for (const std::string_view part : parts) {
+    end = static_cast<char*>(std::memcpy(end, part.data(), part.size())) +
+          part.size();
+  }
+  (void)std::fwrite(line, 1, length, stderr);
+  std::free(line);
+}
+
+}  // namespace
 
 void warn(const char* format, ...) {
   const int saved_errno = errno;
-
-  // The line is put together in memory and written at once, so that it is
-  // never interleaved with anything else on standard error.
-  char* line = nullptr;
-  std::size_t length = 0;
-  FILE* out = open_memstream(&line, &length);
-  if (out == nullptr) {
-    errno = saved_errno;
-    return;
-  }
+  char* message = nullptr;
   va_list args;
   va_start(args, format);
-  (void)std::fputs("kestrel: ", out);
-  (void)std::vfprintf(out, format, args);
-  (void)std::fprintf(out, ": %s\n", std::strerror(saved_errno));
+  const int length = vasprintf(&message, format, args);
   va_end(args);
-  if (std::fclose(out) == 0) {
-    (void)std::fwrite(line, 1, length, stderr);
+  if (length >= 0) {
+    write_line({message, static_cast<std::size_t>(length)},
+               std::strerror(saved_errno));
+    std::free(message);
   }
-  std::free(line);
   errno = saved_errno;
 }
