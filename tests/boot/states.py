@@ -93,7 +93,8 @@ def localtime_missing_default(root, release):
 
 def fifo_staged_version(root, release):
     """A staged update whose +VERSION is a FIFO that nobody writes: reading
-    it would block for ever, so kestrel must treat it as unreadable."""
+    it would block for ever, so kestrel treats it as unreadable; the update's
+    version is its directory name, so it is still adopted."""
     update = stage(root, release + ".1.1", release)
     version = os.path.join(root, update[1:], "zoneinfo/+VERSION")
     os.remove(version)
@@ -101,9 +102,10 @@ def fifo_staged_version(root, release):
     link(root, TZ + "/zoneinfo", "/usr/share/zoneinfo.default")
     link(root, TZ + "/tz_latest", update)
     link(root, TZ + "/localtime", "/var/db/timezone/zoneinfo/Europe/Paris")
-    return {"links": {TZ + "/zoneinfo": "/usr/share/zoneinfo.default"},
-            "files": {}, "absent": [TZ + "/TZVersionDiffRecord"],
-            "warnings": None, "date": PARIS}
+    return {"links": {TZ + "/zoneinfo": update + "/zoneinfo"},
+            "files": {TZ + "/TZVersionDiffRecord":
+                      f"{release}.1.0_{release}.1.1".encode()},
+            "absent": [TZ + "/needs_cleanup"], "warnings": [], "date": PARIS}
 
 
 STATES = {state.__name__: state for state in (
