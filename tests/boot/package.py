@@ -1,68 +1,28 @@
-"""The kestrel package installed into the test system."""
+"""The kestrel package that the test system gets: the project's own .deb,
+built by tools/build-package, or one built before (the package test's)."""
 
+import glob
 import os
 import subprocess
 
-# Until the project's own Debian package lands, a package of the same
-# contents is put together here from a built binary and the unit below.
-UNIT = """\
-[Unit]
-Description=Reconcile the time-zone data links
-DefaultDependencies=no
-RequiresMountsFor=/var/db
-After=local-fs.target
-Before=sysinit.target shutdown.target
-Conflicts=shutdown.target
-
-[Service]
-Type=oneshot
-RemainAfterExit=yes
-TimeoutStartSec=30s
-ExecStart=/usr/sbin/kestrel
-ProtectSystem=strict
-ReadWritePaths=/var/db
-PrivateNetwork=yes
-CapabilityBoundingSet=
-NoNewPrivileges=yes
-SystemCallFilter=@system-service
-
-[Install]
-WantedBy=sysinit.target
-"""
-
-CONTROL = """\
-Package: kestrel
-Version: 0~boottest
-Architecture: amd64
-Maintainer: kestrel developers <kestrel@localhost>
-Description: time-zone data link reconciler
-"""
-
-POSTINST = """\
-#!/bin/sh
-set -e
-deb-systemd-helper enable kestrel.service
-"""
+SOURCE = os.path.join(os.path.dirname(os.path.abspath(__file__)), "../..")
 
 
-def write(path, text, mode=0o644):
-    os.makedirs(os.path.dirname(path), exist_ok=True)
-    with open(path, "w") as out:
-        out.write(text)
-    os.chmod(path, mode)
+def find(directory):
+    """The kestrel .deb in directory (not its debug-symbol package)."""
+    debs = glob.glob(os.path.join(directory, "kestrel_*.deb"))
+    if len(debs) != 1:
+        raise SystemExit(f"boot-test: expected one kestrel_*.deb in "
+                         f"{directory}, found {len(debs)}")
+    return debs[0]
 
 
-def build(work, kestrel):
-    """Builds the package from the binary KESTREL; returns its path."""
-    tree = os.path.join(work, "package")
-    subprocess.run(["rm", "-rf", tree], check=True)
-    os.makedirs(os.path.join(tree, "usr/sbin"))
-    subprocess.run(["install", "-m", "0755", kestrel,
-                    os.path.join(tree, "usr/sbin/kestrel")], check=True)
-    write(os.path.join(tree, "lib/systemd/system/kestrel.service"), UNIT)
-    write(os.path.join(tree, "DEBIAN/control"), CONTROL)
-    write(os.path.join(tree, "DEBIAN/postinst"), POSTINST, 0o755)
-    deb = os.path.join(work, "kestrel.deb")
-    subprocess.run(["dpkg-deb", "--root-owner-group", "-Zxz", "--build",
-                    tree, deb], check=True, stdout=subprocess.DEVNULL)
-    return deb
+def build(work):
+    """Builds the package from the tracked tree; returns its path. Its tests
+    are left out here: the package test builds the same tree with them."""
+    out = os.path.join(work, "package")
+    subprocess.run(["rm", "-rf", out], check=True)
+    env = dict(os.environ, DEB_BUILD_OPTIONS="nocheck")
+    subprocess.run([os.path.join(SOURCE, "tools/build-package"), out],
+                   check=True, env=env, stdout=subprocess.DEVNULL)
+    return find(out)
