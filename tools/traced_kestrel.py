@@ -33,8 +33,8 @@ TIMEOUT = 20  # seconds; a run takes a few hundredths
 def _load_run_scenario():
     loader = importlib.machinery.SourceFileLoader(
         "run_scenario", os.path.join(TOOLS, "run-scenario"))
-    spec = importlib.util.spec_from_loader("run_scenario", loader)
-    module = importlib.util.module_from_spec(spec)
+    module = importlib.util.module_from_spec(
+        importlib.util.spec_from_loader("run_scenario", loader))
     loader.exec_module(module)
     return module
 

@@ -2,7 +2,6 @@
 // words far longer than any release name, and FIFOs where a word is read.
 
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include <cerrno>
 #include <cstring>
@@ -13,6 +12,7 @@
 #include "dataset/kal_dataset.h"
 #include "dataset/kal_icu.h"
 #include "dataset/kal_zoneinfo.h"
+#include "deadline.h"
 #include "gtest/gtest.h"
 #include "outcome.h"
 #include "tree.h"
@@ -25,15 +25,6 @@ const std::string kSystemVersion = "/usr/share/zoneinfo.default/+VERSION";
 const std::string kFormatFile = "/usr/share/icu/icutzformat.txt";
 const std::string kStaged = "/var/db/timezone/tz/2020a.1.0";
 const std::string kStagedVersion = kStaged + "/zoneinfo/+VERSION";
-
-// Kills the test, as a failure, if building a component never returns.
-class deadline {
- public:
-  deadline() { alarm(10); }
-  ~deadline() { alarm(0); }
-  deadline(const deadline&) = delete;
-  deadline& operator=(const deadline&) = delete;
-};
 
 void make_fifo(const std::string& path) {
   tree::make_dir(path.substr(0, path.rfind('/')));

@@ -15,6 +15,7 @@
 #include <string>
 
 #include "captured_stderr.h"
+#include "deadline.h"
 #include "fs/word_file.h"
 #include "gtest/gtest.h"
 #include "scratch_dir.h"
@@ -36,15 +37,6 @@ std::string file_stream_word(const std::string& path) {
   in >> word;
   return word;
 }
-
-// Kills the test, as a failure, if a read never returns.
-class deadline {
- public:
-  deadline() { alarm(10); }
-  ~deadline() { alarm(0); }
-  deadline(const deadline&) = delete;
-  deadline& operator=(const deadline&) = delete;
-};
 
 void make_fifo(const std::string& path) {
   ASSERT_EQ(mkfifo(path.c_str(), 0644), 0) << std::strerror(errno);

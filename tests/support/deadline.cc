@@ -1,0 +1,13 @@
+#include "deadline.h"
+
+#include <unistd.h>
+
+namespace {
+
+constexpr unsigned kSeconds = 10;
+
+}  // namespace
+
+deadline::deadline() { alarm(kSeconds); }
+
+deadline::~deadline() { alarm(0); }
