@@ -113,6 +113,19 @@ def build_device(scratch, tree):
     return device
 
 
+def strace_wrapper(directory, strace_options):
+    """Writes into directory a command for the device sandbox's
+    DEVICE_SANDBOX_WRAPPER that runs the changed-root kestrel under strace
+    with strace_options, and returns its path."""
+    wrapper = os.path.join(directory, "wrapper")
+    command = ["strace"] + strace_options
+    with open(wrapper, "w") as out:
+        out.write("#!/bin/sh\nexec " + " ".join(
+            shlex.quote(word) for word in command) + ' -- "$@"\n')
+    os.chmod(wrapper, 0o755)
+    return wrapper
+
+
 def run_kestrel(kestrel, device, strace_options=None):
     """Runs kestrel on the device directory, under strace when
     strace_options is a list, and reads the device back."""
@@ -122,14 +135,8 @@ def run_kestrel(kestrel, device, strace_options=None):
         env.pop("DEVICE_SANDBOX_WRAPPER", None)
         trace_file = os.path.join(scratch, "trace")
         if strace_options is not None:
-            wrapper = os.path.join(scratch, "wrapper")
-            command = ["strace", "-qq", "-y", "-o", trace_file]
-            command += strace_options
-            with open(wrapper, "w") as out:
-                out.write("#!/bin/sh\nexec " + " ".join(
-                    shlex.quote(word) for word in command) + ' -- "$@"\n')
-            os.chmod(wrapper, 0o755)
-            env["DEVICE_SANDBOX_WRAPPER"] = wrapper
+            env["DEVICE_SANDBOX_WRAPPER"] = strace_wrapper(
+                scratch, ["-qq", "-y", "-o", trace_file] + strace_options)
         process = subprocess.Popen([SANDBOX, device, kestrel],
                                    stdin=subprocess.DEVNULL,
                                    stdout=subprocess.DEVNULL,
