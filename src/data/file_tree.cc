@@ -6,6 +6,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
@@ -86,6 +87,32 @@ std::string make_temporary(const std::string& pattern) {
     fail("cannot make a directory like", pattern);
   }
   return name.data();
+}
+
+std::vector<std::string> entries(const std::string& path) {
+  std::vector<std::string> names;
+  const std::unique_ptr<DIR, int (*)(DIR*)> listing(opendir(path.c_str()),
+                                                    closedir);
+  if (listing) {
+    while (const dirent* entry = readdir(listing.get())) {
+      names.emplace_back(entry->d_name);
+    }
+  }
+  std::sort(names.begin(), names.end());
+  return names;
+}
+
+void sync_directory(const std::string& path) {
+  const int fd = open(path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  if (fd < 0 || fsync(fd) != 0) {
+    const int saved = errno;
+    if (fd >= 0) {
+      (void)close(fd);
+    }
+    errno = saved;
+    fail("cannot sync", path);
+  }
+  (void)close(fd);
 }
 
 }  // namespace file_tree

@@ -2,6 +2,7 @@
 #define KESTREL_DATA_FILE_TREE_H_
 
 #include <string>
+#include <vector>
 
 // Whole-directory operations over the trees kestrel-data makes: release
 // sources, built sets and staging scratch directories. Failures raise
@@ -21,6 +22,13 @@ void copy_file(const std::string& from, const std::string& to, int mode);
 
 // A fresh directory made by mkdtemp(3) from pattern (ending in XXXXXX).
 std::string make_temporary(const std::string& pattern);
+
+// The names in the directory at path, sorted, "." and ".." among them; none
+// when it cannot be read.
+std::vector<std::string> entries(const std::string& path);
+
+// fsync(2) of the directory at path, so that the entries made in it last.
+void sync_directory(const std::string& path);
 
 }  // namespace file_tree
 

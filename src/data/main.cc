@@ -8,6 +8,9 @@
 #include <vector>
 
 #include "data/build_command.h"
+#include "data/pack_command.h"
+#include "data/stage_command.h"
+#include "data/status_command.h"
 #include "data/verify_command.h"
 
 namespace {
@@ -20,6 +23,9 @@ struct subcommand {
 constexpr subcommand kSubcommands[] = {
     {"build", run_build},
     {"verify", run_verify},
+    {"pack", run_pack},
+    {"stage", run_stage},
+    {"status", run_status},
 };
 
 }  // namespace
@@ -35,6 +41,10 @@ int main(int argc, char** argv) {
       return command.run(args);
     } catch (const std::exception& e) {
       std::fprintf(stderr, "kestrel-data: %s\n", e.what());
+      return EXIT_FAILURE;
+    } catch (...) {
+      // kestrel's own helpers raise errno as an int, after their warning.
+      std::fprintf(stderr, "kestrel-data: %s failed\n", command.name);
       return EXIT_FAILURE;
     }
   }

@@ -49,7 +49,7 @@ release_source::~release_source() {
 
 std::string release_source::version() const {
   const std::string version = fs::read_first_word(file("version"));
-  if (!std::regex_match(version, std::regex("[0-9]{4}[a-z]+"))) {
+  if (!is_release_name(version)) {
     throw std::runtime_error("the release's version file does not name a "
                              "release: \"" + version + "\"");
   }
@@ -73,4 +73,8 @@ std::string release_source::make_tzdata_zi() const {
 
 std::string release_source::file(const std::string& name) const {
   return dir + "/" + name;
+}
+
+bool is_release_name(const std::string& text) {
+  return std::regex_match(text, std::regex("[0-9]{4}[a-z]+"));
 }

@@ -29,4 +29,8 @@ class release_source {
   std::string dir;
 };
 
+// Whether text names a tz release: four digits and one or more lower-case
+// letters, such as 2026a.
+bool is_release_name(const std::string& text);
+
 #endif  // KESTREL_DATA_RELEASE_SOURCE_H_
