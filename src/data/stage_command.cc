@@ -116,6 +116,7 @@ std::string stage_set(const set_image& image) {
   // Checked before the lock, so that a refusal leaves not even the lock
   // file, and again under it, against what another staging may have done.
   refuse_unless_adoptable(image);
+  check_space(image);
   const staging_lock lock;
   refuse_unless_adoptable(image);
   check_space(image);

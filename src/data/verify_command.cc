@@ -13,9 +13,13 @@
 
 namespace {
 
-// The probe beside this program when there is one (a build tree), else the
-// installed one.
+// The probe KESTREL_ICU_PROBE names, else the one beside this program when
+// there is one (a build tree), else the installed one.
 std::string probe_path() {
+  const char* named = std::getenv("KESTREL_ICU_PROBE");
+  if (named != nullptr && *named != '\0') {
+    return named;
+  }
   char self[PATH_MAX] = {};
   const ssize_t n = readlink("/proc/self/exe", self, sizeof self - 1);
   std::string beside = n > 0 ? std::string(self, static_cast<std::size_t>(n))

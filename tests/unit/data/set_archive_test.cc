@@ -1,63 +1,19 @@
 #include "data/set_archive.h"
 
-#include <zlib.h>
-
 #include <functional>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
-#include "data/manifest.h"
 #include "data/tar_header.h"
 #include "gtest/gtest.h"
+#include "hand_made_archive.h"
 #include "scratch_dir.h"
 #include "tree.h"
 
 namespace {
 
-// One raw member of a hand-made archive.
-struct raw_member {
-  std::string path;
-  char type;
-  std::string data;  // bytes or link target
-};
-
-std::string tar_bytes(const std::vector<raw_member>& members) {
-  std::string bytes;
-  for (const raw_member& m : members) {
-    const bool file = m.type == '0';
-    const auto header = tar_header::make(m.path, m.type, 0644,
-                                         file ? m.data.size() : 0,
-                                         file ? "" : m.data);
-    bytes.append(header.data(), header.size());
-    if (file) {
-      bytes += m.data;
-      bytes.append((512 - m.data.size() % 512) % 512, '\0');
-    }
-  }
-  return bytes + std::string(1024, '\0');
-}
-
-void write_gzip(const std::string& path, const std::string& bytes) {
-  gzFile out = gzopen(path.c_str(), "wb");
-  ASSERT_NE(out, nullptr);
-  ASSERT_EQ(gzwrite(out, bytes.data(), static_cast<unsigned>(bytes.size())),
-            static_cast<int>(bytes.size()));
-  ASSERT_EQ(gzclose(out), Z_OK);
-}
-
 const std::string kVersion = "2026a\n";
-
-std::string manifest_of(const std::string& path, const std::string& data) {
-  return sha256_hex(data) + "  " + path + "\n";
-}
-
-std::vector<raw_member> good_members() {
-  return {{kManifestName, '0', manifest_of("zoneinfo/+VERSION", kVersion)},
-          {"zoneinfo/", '5', ""},
-          {"zoneinfo/+VERSION", '0', kVersion},
-          {"zoneinfo/V", '2', "+VERSION"}};
-}
 
 TEST(set_archive_test, a_packed_set_reads_back_the_same) {
   const scratch_dir dir;
