@@ -62,8 +62,8 @@ void make_icutz(const release_source& source, const std::string& icu_dir,
   const std::string list_file = source.file("kestrel-icu-items.txt");
   write_text(list_file, list);
   const std::string data_file = out + "/icutz" + kIcuSchema + ".dat";
-  if (child_process{{"icupkg", "-tl", "-a", list_file, "-s", out, "new",
-                     data_file}}
+  if (child_process{
+          {"icupkg", "-tl", "-a", list_file, "-s", out, "new", data_file}}
               .run() != 0 ||
       chmod(data_file.c_str(), 0644) != 0) {
     throw std::runtime_error("icupkg could not package the ICU resources");

@@ -12,8 +12,7 @@ inline constexpr char kIcuSchema[] = "44l";
 
 // The four resources ICU reads from ICU_TIMEZONE_FILES_DIR.
 inline constexpr const char* kIcuResources[] = {
-    "zoneinfo64.res", "metaZones.res", "timezoneTypes.res",
-    "windowsZones.res"};
+    "zoneinfo64.res", "metaZones.res", "timezoneTypes.res", "windowsZones.res"};
 
 // Makes the data set of a tz release in out_dir: zoneinfo/ compiled by zic,
 // with +VERSION, the zone tables and tzdata.zi; icutz/ with the ICU

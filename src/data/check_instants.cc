@@ -27,8 +27,8 @@ std::vector<std::int64_t> transitions_in_span(const tzif_file& zone) {
       zone.transitions.empty() ? kCheckFrom : zone.transitions.back();
   if (!zone.footer.empty()) {
     const posix_tz_rule rule(zone.footer);
-    for (std::int64_t year = std::max(kYearFrom, year_of(last));
-         year < kYearTo; ++year) {
+    for (std::int64_t year = std::max(kYearFrom, year_of(last)); year < kYearTo;
+         ++year) {
       for (const std::int64_t t : rule.changes_in(year)) {
         if (t > last && t >= kCheckFrom && t < kCheckTo) {
           all.push_back(t);

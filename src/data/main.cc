@@ -21,11 +21,8 @@ struct subcommand {
 };
 
 constexpr subcommand kSubcommands[] = {
-    {"build", run_build},
-    {"verify", run_verify},
-    {"pack", run_pack},
-    {"stage", run_stage},
-    {"status", run_status},
+    {"build", run_build}, {"verify", run_verify}, {"pack", run_pack},
+    {"stage", run_stage}, {"status", run_status},
 };
 
 }  // namespace
@@ -40,15 +37,15 @@ int main(int argc, char** argv) {
     try {
       return command.run(args);
     } catch (const std::exception& e) {
-      std::fprintf(stderr, "kestrel-data: %s\n", e.what());
+      (void)std::fprintf(stderr, "kestrel-data: %s\n", e.what());
       return EXIT_FAILURE;
     } catch (...) {
       // kestrel's own helpers raise errno as an int, after their warning.
-      std::fprintf(stderr, "kestrel-data: %s failed\n", command.name);
+      (void)std::fprintf(stderr, "kestrel-data: %s failed\n", command.name);
       return EXIT_FAILURE;
     }
   }
-  std::fputs(
+  (void)std::fputs(
       "usage: kestrel-data build|verify|pack|stage|status ...\n"
       "see kestrel-data(1)\n",
       stderr);

@@ -27,7 +27,8 @@ void skip_name(std::string_view& text) {
     }
     ++n;
   } else {
-    while (n < text.size() && std::isalpha(static_cast<unsigned char>(text[n]))) {
+    while (n < text.size() &&
+           std::isalpha(static_cast<unsigned char>(text[n]))) {
       ++n;
     }
   }
@@ -76,7 +77,8 @@ std::int64_t days_from_civil(std::int64_t year, int month, int day) {
   year -= month <= 2 ? 1 : 0;
   const std::int64_t era = (year >= 0 ? year : year - 399) / 400;
   const std::int64_t yoe = year - era * 400;
-  const std::int64_t doy = (153 * (month + (month > 2 ? -3 : 9)) + 2) / 5 + day - 1;
+  const std::int64_t doy =
+      (153 * (month + (month > 2 ? -3 : 9)) + 2) / 5 + day - 1;
   const std::int64_t doe = yoe * 365 + yoe / 4 - yoe / 100 + doy;
   return era * 146097 + doe - 719468;
 }
@@ -135,7 +137,8 @@ posix_tz_rule::boundary posix_tz_rule::parse_boundary(std::string_view& text) {
   return at;
 }
 
-std::int64_t posix_tz_rule::day_of(const boundary& at, std::int64_t year) const {
+std::int64_t posix_tz_rule::day_of(const boundary& at,
+                                   std::int64_t year) const {
   const std::int64_t jan1 = days_from_civil(year, 1, 1);
   if (at.kind == 'N') {
     return jan1 + at.day;
@@ -146,7 +149,8 @@ std::int64_t posix_tz_rule::day_of(const boundary& at, std::int64_t year) const 
   // Day 0 of the epoch was a Thursday (weekday 4).
   const std::int64_t first = days_from_civil(year, at.month, 1);
   const std::int64_t first_weekday = ((first % 7) + 7 + 4) % 7;
-  std::int64_t day = first + (at.day - first_weekday + 7) % 7 + 7 * (at.week - 1);
+  std::int64_t day = first + (at.day - first_weekday + 7) % 7 +
+                     7 * static_cast<std::int64_t>(at.week - 1);
   const int next_month = at.month % 12 + 1;
   const std::int64_t month_end =
       days_from_civil(year + (at.month == 12 ? 1 : 0), next_month, 1);

@@ -27,7 +27,7 @@ class posix_tz_rule {
     int day = 0;
     int month = 0;
     int week = 0;
-    std::int64_t time = 2 * 3600;
+    std::int64_t time = std::int64_t{2} * 3600;
   };
 
   std::int64_t day_of(const boundary& at, std::int64_t year) const;

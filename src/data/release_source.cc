@@ -48,10 +48,12 @@ release_source::~release_source() {
 }
 
 std::string release_source::version() const {
-  const std::string version = fs::read_first_word(file("version"));
+  std::string version = fs::read_first_word(file("version"));
   if (!is_release_name(version)) {
-    throw std::runtime_error("the release's version file does not name a "
-                             "release: \"" + version + "\"");
+    throw std::runtime_error(
+        "the release's version file does not name a "
+        "release: \"" +
+        version + "\"");
   }
   return version;
 }

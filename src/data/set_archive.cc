@@ -16,18 +16,19 @@ constexpr std::uint64_t kLargestMember = 64U << 20U;
 using gz_file = std::unique_ptr<gzFile_s, int (*)(gzFile)>;
 
 std::uint64_t padded(std::uint64_t size) {
-  return (size + tar_header::kBlock - 1) / tar_header::kBlock * tar_header::kBlock;
+  return (size + tar_header::kBlock - 1) / tar_header::kBlock *
+         tar_header::kBlock;
 }
 
 void write_all(gzFile out, const char* data, std::uint64_t size) {
-  if (size != 0 &&
-      gzwrite(out, data, static_cast<unsigned>(size)) != static_cast<int>(size)) {
+  if (size != 0 && gzwrite(out, data, static_cast<unsigned>(size)) !=
+                       static_cast<int>(size)) {
     throw std::runtime_error("cannot write the archive");
   }
 }
 
-void write_member(gzFile out, const std::string& path, char type,
-                  unsigned mode, const std::string& data) {
+void write_member(gzFile out, const std::string& path, char type, unsigned mode,
+                  const std::string& data) {
   const bool has_bytes = type == '0';
   const tar_header::block header = tar_header::make(
       path, type, mode, has_bytes ? data.size() : 0, has_bytes ? "" : data);
@@ -40,8 +41,8 @@ void write_member(gzFile out, const std::string& path, char type,
 }
 
 void read_exactly(gzFile in, char* into, std::uint64_t size) {
-  if (size != 0 && gzread(in, into, static_cast<unsigned>(size)) !=
-                       static_cast<int>(size)) {
+  if (size != 0 &&
+      gzread(in, into, static_cast<unsigned>(size)) != static_cast<int>(size)) {
     throw std::runtime_error("the archive is truncated or corrupt");
   }
 }
@@ -56,7 +57,8 @@ set_member::kind kind_of(const tar_header& header) {
       return set_member::kind::link;
     case '3':
     case '4':
-      throw std::runtime_error("the archive holds a device file: " + header.path);
+      throw std::runtime_error("the archive holds a device file: " +
+                               header.path);
     case '6':
       throw std::runtime_error("the archive holds a FIFO: " + header.path);
     default:

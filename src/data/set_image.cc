@@ -75,8 +75,8 @@ void sync_and_close(int fd, const std::string& path) {
 }
 
 void write_file(const std::string& path, const set_member& member) {
-  const int fd = open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC,
-                      member.mode);
+  const int fd =
+      open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, member.mode);
   if (fd < 0) {
     fail("cannot create", path);
   }
@@ -110,7 +110,8 @@ set_image set_image::from_directory(const std::string& dir) {
   }
   set_image image;
   try {
-    for (FTSENT* entry = fts_read(walk); entry != nullptr; entry = fts_read(walk)) {
+    for (FTSENT* entry = fts_read(walk); entry != nullptr;
+         entry = fts_read(walk)) {
       if (entry->fts_info == FTS_DP || entry->fts_level == 0) {
         continue;
       }
@@ -177,7 +178,8 @@ std::string set_image::schema() const {
 std::uint64_t set_image::disk_bytes(std::uint64_t block_size) const {
   std::uint64_t total = 0;
   for (const set_member& member : entries) {
-    const std::uint64_t blocks = (member.data.size() + block_size - 1) / block_size;
+    const std::uint64_t blocks =
+        (member.data.size() + block_size - 1) / block_size;
     total += std::max<std::uint64_t>(blocks, 1) * block_size;
   }
   return total;

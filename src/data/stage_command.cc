@@ -97,10 +97,10 @@ std::string install_verified(const set_image& image) {
     if (!verify_set(scratch)) {
       refuse("the set does not pass verification");
     }
-    const std::string final_path =
-        paths::kStagedDir + next_version(image.release());
+    std::string final_path = paths::kStagedDir + next_version(image.release());
     if (rename(scratch.c_str(), final_path.c_str()) != 0) {
-      throw std::runtime_error("cannot rename " + scratch + " to " + final_path);
+      throw std::runtime_error("cannot rename " + scratch + " to " +
+                               final_path);
     }
     file_tree::sync_directory(paths::kStagedDir);
     return final_path;
@@ -124,7 +124,7 @@ std::string stage_set(const set_image& image) {
     throw std::runtime_error(std::string("cannot make ") + paths::kStagedDir);
   }
   remove_leftover_scratch();
-  const std::string staged = install_verified(image);
+  std::string staged = install_verified(image);
   point_latest_at(staged);
   return staged;
 }

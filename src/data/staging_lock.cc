@@ -24,11 +24,10 @@ staging_lock::staging_lock()
   if (flock(fd, LOCK_EX | LOCK_NB) != 0) {
     const int saved = errno;
     (void)close(fd);
-    throw std::runtime_error(
-        saved == EWOULDBLOCK
-            ? "another staging is running; nothing staged"
-            : std::string("cannot lock ") + kLockFile + ": " +
-                  std::strerror(saved));
+    throw std::runtime_error(saved == EWOULDBLOCK
+                                 ? "another staging is running; nothing staged"
+                                 : std::string("cannot lock ") + kLockFile +
+                                       ": " + std::strerror(saved));
   }
 }
 

@@ -25,29 +25,34 @@ std::string json_string(const std::string& text) {
 }
 
 std::string as_json(const device_state& s) {
-  std::string out = "{\"system\":{\"version\":" + json_string(s.system_version) +
-                    ",\"icu_schema\":" + json_string(s.system_schema) + "}";
+  std::string out =
+      "{\"system\":{\"version\":" + json_string(s.system_version) +
+      ",\"icu_schema\":" + json_string(s.system_schema) + "}";
   out += ",\"designated\":{\"path\":" + json_string(s.designated_path) +
          ",\"version\":" + json_string(s.designated_version) + "}";
   out += ",\"tz_latest\":" + json_string(s.latest) + ",\"staged\":[";
   for (std::size_t i = 0; i < s.staged.size(); ++i) {
     const staged_set& set = s.staged[i];
-    out += std::string(i == 0 ? "" : ",") + "{\"path\":" + json_string(set.path) +
-           ",\"version\":" + json_string(set.version) +
-           ",\"icu_schema\":" + json_string(set.schema) +
-           ",\"adopted_at_next_start\":" + (set.adoption.yes ? "true" : "false") +
-           ",\"reason\":" + json_string(set.adoption.reason) + "}";
+    out +=
+        std::string(i == 0 ? "" : ",") + "{\"path\":" + json_string(set.path) +
+        ",\"version\":" + json_string(set.version) +
+        ",\"icu_schema\":" + json_string(set.schema) +
+        ",\"adopted_at_next_start\":" + (set.adoption.yes ? "true" : "false") +
+        ",\"reason\":" + json_string(set.adoption.reason) + "}";
   }
-  out += std::string("],\"needs_cleanup\":") + (s.cleanup_marker ? "true" : "false");
+  out += std::string("],\"needs_cleanup\":") +
+         (s.cleanup_marker ? "true" : "false");
   out += ",\"last_version_change\":" + json_string(s.version_record) + "}\n";
   return out;
 }
 
 std::string as_text(const device_state& s) {
   std::string out = "system partition: " + s.system_version + ", ICU schema " +
-                    (s.system_schema.empty() ? "(none)" : s.system_schema) + "\n";
+                    (s.system_schema.empty() ? "(none)" : s.system_schema) +
+                    "\n";
   out += "designated by the links: " + s.designated_version +
-         (s.designated_path.empty() ? "" : " (" + s.designated_path + ")") + "\n";
+         (s.designated_path.empty() ? "" : " (" + s.designated_path + ")") +
+         "\n";
   out += "tz_latest: " + (s.latest.empty() ? "(none)" : s.latest) + "\n";
   out += "staged sets: " + std::to_string(s.staged.size()) + "\n";
   for (const staged_set& set : s.staged) {
@@ -74,6 +79,6 @@ int run_status(const std::vector<std::string>& args) {
   if (args.size() > 1 || (args.size() == 1 && !json)) {
     throw usage_error("status [--json]");
   }
-  std::fputs(format_status(device_state::read(), json).c_str(), stdout);
+  (void)std::fputs(format_status(device_state::read(), json).c_str(), stdout);
   return EXIT_SUCCESS;
 }

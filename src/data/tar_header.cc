@@ -77,7 +77,10 @@ tar_header::block tar_header::make(const std::string& path, char type,
   put_octal(b, kMtime, 12, 0);
   b[kType] = type;
   put_text(b, kLink, kNameSize, link_target);
-  put_text(b, kMagic, 8, std::string("ustar\0" "00", 8));
+  put_text(b, kMagic, 8,
+           std::string("ustar\0"
+                       "00",
+                       8));
   put_octal(b, kChecksum, 7, checksum(b));
   b[kChecksum + 7] = ' ';
   return b;
@@ -91,7 +94,8 @@ tar_header::tar_header(const block& bytes) {
     throw std::runtime_error("the archive has a header with a bad checksum");
   }
   const std::string prefix = get_text(bytes, kPrefix, kPrefixSize);
-  path = (prefix.empty() ? "" : prefix + "/") + get_text(bytes, kName, kNameSize);
+  path =
+      (prefix.empty() ? "" : prefix + "/") + get_text(bytes, kName, kNameSize);
   type = bytes[kType] == '\0' ? '0' : bytes[kType];
   mode = static_cast<unsigned>(get_octal(bytes, kMode, 8));
   size = get_octal(bytes, kSize, 12);

@@ -45,8 +45,8 @@ counts read_header(std::string_view bytes, std::size_t at) {
 
 // The size of a data block whose times are width bytes wide.
 std::uint64_t block_size(const counts& c, std::uint64_t width) {
-  return c.time * width + c.time + c.type * 6 + c.chars +
-         c.leap * (width + 4) + c.isstd + c.isut;
+  return c.time * width + c.time + c.type * 6 + c.chars + c.leap * (width + 4) +
+         c.isstd + c.isut;
 }
 
 }  // namespace

@@ -22,8 +22,8 @@ std::string probe_path() {
   }
   char self[PATH_MAX] = {};
   const ssize_t n = readlink("/proc/self/exe", self, sizeof self - 1);
-  std::string beside = n > 0 ? std::string(self, static_cast<std::size_t>(n))
-                             : std::string();
+  std::string beside =
+      n > 0 ? std::string(self, static_cast<std::size_t>(n)) : std::string();
   beside = beside.substr(0, beside.rfind('/') + 1) + "kestrel-icu-probe";
   return access(beside.c_str(), X_OK) == 0 ? beside : KESTREL_ICU_PROBE;
 }
@@ -63,8 +63,8 @@ int run_verify(const std::vector<std::string>& args) {
     throw usage_error("verify SETDIR");
   }
   if (!verify_set(args[0])) {
-    std::fprintf(stderr, "kestrel-data: %s does not pass verification\n",
-                 args[0].c_str());
+    (void)std::fprintf(stderr, "kestrel-data: %s does not pass verification\n",
+                       args[0].c_str());
     return EXIT_FAILURE;
   }
   return EXIT_SUCCESS;

@@ -10,8 +10,7 @@ constexpr std::int64_t kMillis = 1000;
 }  // namespace
 
 icu_zone::icu_zone(const std::string& name)
-    : zone(icu::TimeZone::createTimeZone(
-          icu::UnicodeString::fromUTF8(name))) {}
+    : zone(icu::TimeZone::createTimeZone(icu::UnicodeString::fromUTF8(name))) {}
 
 bool icu_zone::known() const {
   return zone != nullptr && *zone != icu::TimeZone::getUnknown();
@@ -41,7 +40,8 @@ std::string icu_zone::all_ids() {
       icu::TimeZone::createEnumeration(status));
   std::string text;
   for (const icu::UnicodeString* id = ids->snext(status);
-       ids != nullptr && U_SUCCESS(status) && id != nullptr; id = ids->snext(status)) {
+       ids != nullptr && U_SUCCESS(status) && id != nullptr;
+       id = ids->snext(status)) {
     id->toUTF8String(text);
     text += '\n';
   }

@@ -18,12 +18,13 @@
 int main(int argc, char** argv) {
   const std::string command = argc > 1 ? argv[1] : "";
   if (command == "ids" && argc == 2) {
-    std::fputs(icu_zone::all_ids().c_str(), stdout);
+    (void)std::fputs(icu_zone::all_ids().c_str(), stdout);
     return EXIT_SUCCESS;
   }
   if (command == "check" && argc == 4) {
     return run_probe_check(argv[2], argv[3]) ? EXIT_SUCCESS : EXIT_FAILURE;
   }
-  std::fputs("usage: kestrel-icu-probe ids | check RELEASE ZONEINFO\n", stderr);
+  (void)std::fputs("usage: kestrel-icu-probe ids | check RELEASE ZONEINFO\n",
+                   stderr);
   return 2;
 }

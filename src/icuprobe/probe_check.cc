@@ -50,8 +50,8 @@ bool run_probe_check(const std::string& release, const std::string& zoneinfo) {
   }
   std::printf("ICU tz version: %s (release %s)\n", version.c_str(),
               release.c_str());
-  std::printf("zones: %zu\ninstants: %lld\ndisagreements: %lld\n",
-              names.size(), static_cast<long long>(instants),
+  std::printf("zones: %zu\ninstants: %lld\ndisagreements: %lld\n", names.size(),
+              static_cast<long long>(instants),
               static_cast<long long>(disagreements));
   std::printf("disagreeing zones: %zu", disagreeing.size());
   for (const std::string& name : disagreeing) {

@@ -18,12 +18,15 @@ TEST(check_instants_test, a_fixed_zone_is_checked_at_the_span_ends_and_middle) {
   EXPECT_EQ(check_instants({{}, ""}), expected);
 }
 
-TEST(check_instants_test, each_transition_brings_itself_the_second_before_and_a_midpoint) {
+TEST(check_instants_test,
+     each_transition_brings_itself_the_second_before_and_a_midpoint) {
   const std::int64_t t = 946684800;
-  const std::vector<std::int64_t> expected{
-      kCheckFrom,         kCheckFrom + (t - kCheckFrom) / 2,
-      t - 1,              t,
-      t + (kCheckTo - t) / 2, kCheckTo - 1};
+  const std::vector<std::int64_t> expected{kCheckFrom,
+                                           kCheckFrom + (t - kCheckFrom) / 2,
+                                           t - 1,
+                                           t,
+                                           t + (kCheckTo - t) / 2,
+                                           kCheckTo - 1};
   // Transitions outside the span bring nothing.
   EXPECT_EQ(check_instants({{kCheckFrom - 5000, t, kCheckTo + 1}, "<+02>-2"}),
             expected);

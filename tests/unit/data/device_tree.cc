@@ -47,7 +47,8 @@ std::map<std::string, std::string> snapshot(const std::string& root) {
 
 void make_device(const std::string& system_release,
                  const std::string& system_schema) {
-  tree::write_file("/usr/share/zoneinfo.default/+VERSION", system_release + "\n");
+  tree::write_file("/usr/share/zoneinfo.default/+VERSION",
+                   system_release + "\n");
   tree::write_file("/usr/share/icu/icutzformat.txt", system_schema + "\n");
   tree::make_link("/usr/share/zoneinfo.default", "/var/db/timezone/zoneinfo");
 }

@@ -13,7 +13,8 @@ TEST(manifest_test, sha256_of_known_texts) {
     const char* sum;
   } kSums[] = {
       {"", "e3b0c44298fc1c149afbf4c8996fb92427ae41e4649b934ca495991b7852b855"},
-      {"abc", "ba7816bf8f01cfea414140de5dae2223b00361a396177a9cb410ff61f20015ad"},
+      {"abc",
+       "ba7816bf8f01cfea414140de5dae2223b00361a396177a9cb410ff61f20015ad"},
       {std::string(1000000, 'a'),
        "cdc76e5c9914fb9281a1c7e284d73e67f1809a48a497200e046d39ccc7112cd0"},
   };
@@ -33,7 +34,8 @@ set_image sample_image() {
 TEST(manifest_test, lists_every_regular_file_with_its_sum) {
   EXPECT_EQ(make_manifest(sample_image()),
             sha256_hex("2026a\n") + "  zoneinfo/+VERSION\n");
-  EXPECT_NO_THROW(check_manifest(sample_image(), make_manifest(sample_image())));
+  EXPECT_NO_THROW(
+      check_manifest(sample_image(), make_manifest(sample_image())));
 }
 
 TEST(manifest_test, refuses_a_manifest_that_does_not_match) {

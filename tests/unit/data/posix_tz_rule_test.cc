@@ -37,8 +37,9 @@ TEST(posix_tz_rule_test, works_out_the_changes_of_a_year) {
 }
 
 TEST(posix_tz_rule_test, refuses_what_is_not_a_rule) {
-  for (const char* text : {"", "E", "EST", "EST5EDT", "EST5EDT,M3.2.0",
-                           "EST5EDT,M3.2,M11.1.0", "<+03-3", "EST5EDT,M3.2.0,M11.1.0x"}) {
+  for (const char* text :
+       {"", "E", "EST", "EST5EDT", "EST5EDT,M3.2.0", "EST5EDT,M3.2,M11.1.0",
+        "<+03-3", "EST5EDT,M3.2.0,M11.1.0x"}) {
     EXPECT_THROW(posix_tz_rule{text}, std::runtime_error) << text;
   }
 }
@@ -48,8 +49,11 @@ TEST(posix_tz_rule_test, days_from_civil_counts_from_the_epoch) {
     std::int64_t year;
     int month, day;
     std::int64_t days;
-  } kDates[] = {{1970, 1, 1, 0}, {2000, 3, 1, 11017}, {1900, 1, 1, -25567},
-                {2100, 1, 1, 47482}, {1969, 12, 31, -1}};
+  } kDates[] = {{1970, 1, 1, 0},
+                {2000, 3, 1, 11017},
+                {1900, 1, 1, -25567},
+                {2100, 1, 1, 47482},
+                {1969, 12, 31, -1}};
   for (const auto& d : kDates) {
     EXPECT_EQ(days_from_civil(d.year, d.month, d.day), d.days) << d.year;
   }

@@ -23,7 +23,8 @@ child_process build(const std::string& release, const std::string& icu,
   return data;
 }
 
-TEST(real_release_test, each_published_release_verifies_with_its_own_resources) {
+TEST(real_release_test,
+     each_published_release_verifies_with_its_own_resources) {
   for (const char* release : {"2024a", "2025b", "2026a"}) {
     SCOPED_TRACE(release);
     const scratch_dir dir;
@@ -39,12 +40,13 @@ TEST(real_release_test, each_published_release_verifies_with_its_own_resources) 
   }
 }
 
-TEST(real_release_test, a_release_with_older_resources_is_refused_naming_zones) {
+TEST(real_release_test,
+     a_release_with_older_resources_is_refused_naming_zones) {
   const scratch_dir dir;
   child_process data = build("2026c", "2026a", dir / "set");
   EXPECT_NE(data.run(), 0);
-  for (const char* zone : {"Africa/Casablanca", "America/Edmonton",
-                           "America/Vancouver"}) {
+  for (const char* zone :
+       {"Africa/Casablanca", "America/Edmonton", "America/Vancouver"}) {
     EXPECT_NE(data.output.find(std::string("disagreement: ") + zone),
               std::string::npos)
         << data.output;

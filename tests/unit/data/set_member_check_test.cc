@@ -9,12 +9,18 @@ TEST(set_member_check_test, paths_that_stay_inside_the_set) {
     const char* path;
     bool inside;
   } kPaths[] = {
-      {"zoneinfo", true},          {"zoneinfo/Europe/Paris", true},
-      {"icutz/icutz44l.dat", true}, {"", false},
-      {"/etc/passwd", false},       {"..", false},
-      {"zoneinfo/../..", false},    {"zoneinfo/./x", false},
-      {"zoneinfo//x", false},       {"zoneinfo/", false},
-      {"a/../b", false},            {"..x", true},
+      {"zoneinfo", true},
+      {"zoneinfo/Europe/Paris", true},
+      {"icutz/icutz44l.dat", true},
+      {"", false},
+      {"/etc/passwd", false},
+      {"..", false},
+      {"zoneinfo/../..", false},
+      {"zoneinfo/./x", false},
+      {"zoneinfo//x", false},
+      {"zoneinfo/", false},
+      {"a/../b", false},
+      {"..x", true},
   };
   for (const auto& p : kPaths) {
     EXPECT_EQ(path_stays_inside(p.path), p.inside) << p.path;

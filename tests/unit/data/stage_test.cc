@@ -109,7 +109,8 @@ struct refusal {
 
 std::string the_set(const scratch_dir& /*dir*/) { return kSet; }
 
-std::string hand_made(const scratch_dir& dir, const std::vector<raw_member>& m) {
+std::string hand_made(const scratch_dir& dir,
+                      const std::vector<raw_member>& m) {
   write_gzip(dir / "bad.tgz", tar_bytes(m));
   return dir / "bad.tgz";
 }
@@ -118,7 +119,8 @@ int held_lock = -1;
 
 const refusal kRefusals[] = {
     {"system partition of the same release", [] { make_device("2026a"); },
-     the_set, "release 2026a is not newer than 2026a.1.0 of the system partition"},
+     the_set,
+     "release 2026a is not newer than 2026a.1.0 of the system partition"},
     {"system partition newer", [] { make_device("2026b"); }, the_set,
      "not newer than 2026b.1.0 of the system partition"},
     {"links designate a set of the same release",
@@ -142,7 +144,8 @@ const refusal kRefusals[] = {
      the_set, "another staging is running"},
     {"no room for the set",
      [] {
-       ASSERT_EQ(mount("small", "/var/db/timezone", "tmpfs", 0, "size=256k"), 0);
+       ASSERT_EQ(mount("small", "/var/db/timezone", "tmpfs", 0, "size=256k"),
+                 0);
        make_device("2025b");
      },
      the_set, "the set needs"},

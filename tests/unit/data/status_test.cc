@@ -12,9 +12,9 @@ namespace {
 using status_test = clean_device;
 
 void staged(const std::string& version, const std::string& schema = "44l") {
-  tree::write_file("/var/db/timezone/tz/" + version + "/icutz/icutz" + schema +
-                       ".dat",
-                   "data");
+  tree::write_file(
+      "/var/db/timezone/tz/" + version + "/icutz/icutz" + schema + ".dat",
+      "data");
   tree::make_dir("/var/db/timezone/tz/" + version + "/zoneinfo");
 }
 
@@ -40,14 +40,18 @@ TEST_F(status_test, says_which_staged_set_kestrel_would_adopt) {
     const char* latest;
     const char* line;
   } kCases[] = {
-      {"2026a.1.1", "  2026a.1.1, ICU schema 44l, adopted at next start: yes "
-                    "(newer than 2025b.1.0)\n"},
-      {"2026a.1.1", "  2026b.1.2, ICU schema 44l, adopted at next start: no "
-                    "(tz_latest names another set)\n"},
-      {"2026c.1.1", "  2026c.1.1, ICU schema 72l, adopted at next start: no "
-                    "(ICU schema is not the system partition's)\n"},
-      {"2024a.1.1", "  2024a.1.1, ICU schema 44l, adopted at next start: no "
-                    "(not newer than 2025b.1.0)\n"},
+      {"2026a.1.1",
+       "  2026a.1.1, ICU schema 44l, adopted at next start: yes "
+       "(newer than 2025b.1.0)\n"},
+      {"2026a.1.1",
+       "  2026b.1.2, ICU schema 44l, adopted at next start: no "
+       "(tz_latest names another set)\n"},
+      {"2026c.1.1",
+       "  2026c.1.1, ICU schema 72l, adopted at next start: no "
+       "(ICU schema is not the system partition's)\n"},
+      {"2024a.1.1",
+       "  2024a.1.1, ICU schema 44l, adopted at next start: no "
+       "(not newer than 2025b.1.0)\n"},
   };
   for (const auto& c : kCases) {
     (void)std::remove("/var/db/timezone/tz_latest");
@@ -65,9 +69,11 @@ TEST_F(status_test, reports_the_marker_the_record_and_the_designated_set) {
   (void)std::remove("/var/db/timezone/zoneinfo");
   tree::make_link("/var/db/timezone/tz/2026a.1.1/zoneinfo",
                   "/var/db/timezone/zoneinfo");
-  tree::make_link("/var/db/timezone/tz/2026a.1.1", "/var/db/timezone/tz_latest");
+  tree::make_link("/var/db/timezone/tz/2026a.1.1",
+                  "/var/db/timezone/tz_latest");
   tree::write_file("/var/db/timezone/needs_cleanup", "");
-  tree::write_file("/var/db/timezone/TZVersionDiffRecord", "2025b.1.0_2026a.1.1");
+  tree::write_file("/var/db/timezone/TZVersionDiffRecord",
+                   "2025b.1.0_2026a.1.1");
   EXPECT_EQ(
       format_status(device_state::read(), true),
       "{\"system\":{\"version\":\"2025b.1.0\",\"icu_schema\":\"44l\"},"

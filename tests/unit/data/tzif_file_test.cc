@@ -53,7 +53,8 @@ TEST(tzif_file_test, reads_transitions_and_footer_of_compiled_zones) {
 
 TEST(tzif_file_test, refuses_bytes_that_are_no_complete_tzif) {
   const scratch_dir dir;
-  const std::string bytes = tree::file_content(compiled(dir, kZones[1]) + "/Test/Once");
+  const std::string bytes =
+      tree::file_content(compiled(dir, kZones[1]) + "/Test/Once");
   std::string version_one = bytes;
   version_one[4] = '\0';
   for (const std::string& bad :
