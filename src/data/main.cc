@@ -11,6 +11,7 @@
 #include "data/pack_command.h"
 #include "data/stage_command.h"
 #include "data/status_command.h"
+#include "data/usage_error.h"
 #include "data/verify_command.h"
 
 namespace {
@@ -36,6 +37,9 @@ int main(int argc, char** argv) {
     }
     try {
       return command.run(args);
+    } catch (const usage_error& e) {
+      (void)std::fprintf(stderr, "%s\n", e.what());
+      return 2;
     } catch (const std::exception& e) {
       (void)std::fprintf(stderr, "kestrel-data: %s\n", e.what());
       return EXIT_FAILURE;
