@@ -1,6 +1,8 @@
 #include "icuprobe/icu_zone.h"
 
+#include <unicode/basictz.h>
 #include <unicode/strenum.h>
+#include <unicode/tztrans.h>
 #include <unicode/unistr.h>
 
 namespace {
@@ -26,6 +28,27 @@ local_offset icu_zone::at(std::int64_t instant) const {
     return {};
   }
   return {(raw + dst) / kMillis, dst != 0};
+}
+
+std::vector<std::int64_t> icu_zone::transitions(std::int64_t from,
+                                                std::int64_t to) const {
+  std::vector<std::int64_t> found;
+  const auto* basic = dynamic_cast<const icu::BasicTimeZone*>(zone.get());
+  if (basic == nullptr) {
+    return found;
+  }
+  icu::TimeZoneTransition next;
+  // Inclusive of from itself, then each strictly after the previous one.
+  UDate at = static_cast<UDate>(from * kMillis) - 1;
+  while (basic->getNextTransition(at, false, next)) {
+    at = next.getTime();
+    const auto second = static_cast<std::int64_t>(at / kMillis);
+    if (second >= to) {
+      break;
+    }
+    found.push_back(second);
+  }
+  return found;
 }
 
 std::string icu_zone::data_version() {

@@ -6,6 +6,7 @@
 #include <cstdint>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "icuprobe/local_offset.h"
 
@@ -18,6 +19,10 @@ class icu_zone {
   // Whether ICU knows the name: an unknown one reads as Etc/Unknown.
   bool known() const;
   local_offset at(std::int64_t instant) const;
+  // The instants in [from, to) at which ICU's offset or daylight time
+  // changes, in seconds since the epoch.
+  std::vector<std::int64_t> transitions(std::int64_t from,
+                                        std::int64_t to) const;
 
   // ICU's version of its time-zone data, such as 2026a.
   static std::string data_version();

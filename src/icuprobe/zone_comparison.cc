@@ -1,5 +1,6 @@
 #include "icuprobe/zone_comparison.h"
 
+#include <algorithm>
 #include <cstdio>
 #include <ctime>
 #include <exception>
@@ -49,6 +50,14 @@ zone_comparison::zone_comparison(const std::string& name,
     first = e.what();
     return;
   }
+  // ICU's own transitions as well, so that a change only one side makes is
+  // met where that side makes it.
+  for (const std::int64_t t : icu.transitions(kCheckFrom, kCheckTo)) {
+    checked.push_back(t);
+    checked.push_back(t - 1);
+  }
+  std::sort(checked.begin(), checked.end());
+  checked.erase(std::unique(checked.begin(), checked.end()), checked.end());
   const glibc_zone glibc(name);
   for (const std::int64_t instant : checked) {
     ++instants;

@@ -5,7 +5,8 @@
 #include <string>
 
 // ICU against the C library for one zone name, at every instant that
-// check_instants() picks from the name's compiled zone file under zoneinfo.
+// check_instants() picks from the name's compiled zone file under zoneinfo
+// and at each of ICU's own transitions and the second before it.
 // The process's TZDIR must already name zoneinfo.
 struct zone_comparison {
   zone_comparison(const std::string& name, const std::string& zoneinfo);
