@@ -1,13 +1,55 @@
 #include "icuprobe/icu_zone.h"
 
 #include <unicode/basictz.h>
+#include <unicode/dtrule.h>
 #include <unicode/strenum.h>
+#include <unicode/tzrule.h>
 #include <unicode/tztrans.h>
+
 #include <unicode/unistr.h>
+#include <algorithm>
+#include <limits>
 
 namespace {
 
 constexpr std::int64_t kMillis = 1000;
+
+// Adds to found the start times in [from, to) of the zone's rules that are
+// arrays of UTC times, and returns the latest of all their times (or the
+// earliest possible date when there is none). The rules stay the zone's.
+UDate historic_transitions(const icu::BasicTimeZone& zone, std::int64_t from,
+                           std::int64_t to, std::vector<std::int64_t>& found) {
+  UDate latest = -std::numeric_limits<UDate>::max();
+  UErrorCode status = U_ZERO_ERROR;
+  const std::int32_t count = zone.countTransitionRules(status);
+  if (U_FAILURE(status) || count <= 0) {
+    return latest;
+  }
+  std::vector<const icu::TimeZoneRule*> rules(static_cast<std::size_t>(count));
+  const icu::InitialTimeZoneRule* initial = nullptr;
+  std::int32_t filled = count;
+  zone.getTimeZoneRules(initial, rules.data(), filled, status);
+  for (std::int32_t i = 0; U_SUCCESS(status) && i < filled; ++i) {
+    const auto* times =
+        dynamic_cast<const icu::TimeArrayTimeZoneRule*>(rules[i]);
+    if (times == nullptr ||
+        times->getTimeType() != icu::DateTimeRule::UTC_TIME) {
+      continue;
+    }
+    for (std::int32_t j = 0; j < times->countStartTimes(); ++j) {
+      UDate start = 0;
+      if (!times->getStartTimeAt(j, start)) {
+        continue;
+      }
+      latest = std::max(latest, start);
+      const auto second = static_cast<std::int64_t>(start / kMillis);
+      if (second >= from && second < to) {
+        found.push_back(second);
+      }
+    }
+  }
+  return latest;
+}
 
 }  // namespace
 
@@ -37,9 +79,12 @@ std::vector<std::int64_t> icu_zone::transitions(std::int64_t from,
   if (basic == nullptr) {
     return found;
   }
+  // The historic transitions straight from the zone's rules: asking for
+  // them one by one copies the whole array of times at every step.
+  const UDate last_historic = historic_transitions(*basic, from, to, found);
+  // Then the rule-based ones that follow, one by one.
   icu::TimeZoneTransition next;
-  // Inclusive of from itself, then each strictly after the previous one.
-  UDate at = static_cast<UDate>(from * kMillis) - 1;
+  UDate at = std::max(static_cast<UDate>(from * kMillis) - 1, last_historic);
   while (basic->getNextTransition(at, false, next)) {
     at = next.getTime();
     const auto second = static_cast<std::int64_t>(at / kMillis);
