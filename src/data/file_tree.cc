@@ -102,8 +102,7 @@ std::vector<std::string> entries(const std::string& path) {
   return names;
 }
 
-void sync_directory(const std::string& path) {
-  const int fd = open(path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+void sync_and_close(int fd, const std::string& path) {
   if (fd < 0 || fsync(fd) != 0) {
     const int saved = errno;
     if (fd >= 0) {
@@ -112,7 +111,13 @@ void sync_directory(const std::string& path) {
     errno = saved;
     fail("cannot sync", path);
   }
-  (void)close(fd);
+  if (close(fd) != 0) {
+    fail("cannot close", path);
+  }
+}
+
+void sync_directory(const std::string& path) {
+  sync_and_close(open(path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC), path);
 }
 
 }  // namespace file_tree

@@ -27,6 +27,10 @@ std::string make_temporary(const std::string& pattern);
 // when it cannot be read.
 std::vector<std::string> entries(const std::string& path);
 
+// fsync(2) and close(2) of fd, opened on path (a negative fd fails at once,
+// with the errno of its open).
+void sync_and_close(int fd, const std::string& path);
+
 // fsync(2) of the directory at path, so that the entries made in it last.
 void sync_directory(const std::string& path);
 

@@ -60,20 +60,6 @@ set_member member_of(const FTSENT& entry, std::size_t root_length) {
   return member;
 }
 
-void sync_and_close(int fd, const std::string& path) {
-  if (fd < 0 || fsync(fd) != 0) {
-    const int saved = errno;
-    if (fd >= 0) {
-      (void)close(fd);
-    }
-    errno = saved;
-    fail("cannot sync", path);
-  }
-  if (close(fd) != 0) {
-    fail("cannot close", path);
-  }
-}
-
 void write_file(const std::string& path, const set_member& member) {
   const int fd =
       open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, member.mode);
@@ -93,7 +79,7 @@ void write_file(const std::string& path, const set_member& member) {
     (void)close(fd);
     fail("cannot set the mode of", path);
   }
-  sync_and_close(fd, path);
+  file_tree::sync_and_close(fd, path);
 }
 
 }  // namespace
