@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <stdexcept>
 
 #include "data/adoption.h"
@@ -74,40 +75,62 @@ std::string next_version(const std::string& release) {
   return prefix + std::to_string(highest + 1);
 }
 
-void point_latest_at(const std::string& set_path) {
-  if (unlink(kNewLatest) != 0 && errno != ENOENT) {
-    throw std::runtime_error(std::string("cannot remove ") + kNewLatest);
-  }
-  if (symlink(set_path.c_str(), kNewLatest) != 0 ||
-      rename(kNewLatest, paths::kLatestLink) != 0) {
-    throw std::runtime_error(std::string("cannot re-point ") +
-                             paths::kLatestLink);
-  }
-  file_tree::sync_directory(paths::kTimezoneDir);
+[[noreturn]] void fail(const std::string& what) {
+  throw std::runtime_error(what + ": " + std::strerror(errno));
 }
 
+// A new link renamed over tz_latest: readers see the old target or the new,
+// never no link. A leftover new link of an earlier staging goes first.
+void point_latest_at(const std::string& set_path) {
+  if (unlink(kNewLatest) != 0 && errno != ENOENT) {
+    fail(std::string("cannot remove ") + kNewLatest);
+  }
+  if (symlink(set_path.c_str(), kNewLatest) != 0) {
+    fail(std::string("cannot make ") + kNewLatest);
+  }
+  if (rename(kNewLatest, paths::kLatestLink) != 0) {
+    const int saved = errno;
+    (void)unlink(kNewLatest);
+    errno = saved;
+    fail(std::string("cannot re-point ") + paths::kLatestLink);
+  }
+}
+
+// The scratch directory, written, synced and verified, renamed to the set's
+// name and tz_latest pointed at it. Until tz_latest names it, a failure
+// takes the set back to its scratch name and removes it as far as it can;
+// what is left is a scratch directory for the next staging to remove.
 std::string install_verified(const set_image& image) {
   const std::string scratch = file_tree::make_temporary(
       std::string(paths::kStagedDir) + kScratchPrefix + "XXXXXX");
+  std::string final_path;
   try {
     if (chmod(scratch.c_str(), 0755) != 0) {
-      throw std::runtime_error("cannot open up " + scratch);
+      fail("cannot open up " + scratch);
     }
     image.write_into(scratch);
     if (!verify_set(scratch)) {
       refuse("the set does not pass verification");
     }
-    std::string final_path = paths::kStagedDir + next_version(image.release());
+    final_path = paths::kStagedDir + next_version(image.release());
     if (rename(scratch.c_str(), final_path.c_str()) != 0) {
-      throw std::runtime_error("cannot rename " + scratch + " to " +
-                               final_path);
+      final_path.clear();
+      fail("cannot rename " + scratch);
     }
     file_tree::sync_directory(paths::kStagedDir);
-    return final_path;
+    point_latest_at(final_path);
   } catch (...) {
-    file_tree::remove(scratch);
+    if (!final_path.empty()) {
+      (void)rename(final_path.c_str(), scratch.c_str());
+    }
+    try {
+      file_tree::remove(scratch);
+    } catch (...) {
+      // Left for the next staging, which removes every scratch directory.
+    }
     throw;
   }
+  return final_path;
 }
 
 }  // namespace
@@ -125,7 +148,12 @@ std::string stage_set(const set_image& image) {
   }
   remove_leftover_scratch();
   std::string staged = install_verified(image);
-  point_latest_at(staged);
+  // tz_latest names the complete set now; only its durability is left.
+  try {
+    file_tree::sync_directory(paths::kTimezoneDir);
+  } catch (const std::runtime_error& e) {
+    throw std::runtime_error("staged " + staged + ", but " + e.what());
+  }
   return staged;
 }
 
