@@ -2,6 +2,7 @@
 #define KESTREL_ICUPROBE_LOCAL_OFFSET_H_
 
 #include <cstdint>
+#include <string>
 
 // What a reader of a zone says of one instant: the total offset from UTC in
 // seconds and whether daylight time is in effect.
@@ -11,5 +12,8 @@ struct local_offset {
 
   bool operator==(const local_offset&) const = default;
 };
+
+// The offset as +HH:MM, with " daylight" when daylight time is in effect.
+std::string describe_offset(const local_offset& offset);
 
 #endif  // KESTREL_ICUPROBE_LOCAL_OFFSET_H_

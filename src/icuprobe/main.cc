@@ -7,6 +7,9 @@
 //       compares ICU with the C library (TZDIR=ZONEINFO) for every zone and
 //       link of ZONEINFO/tzdata.zi and checks that each ID read from
 //       standard input resolves; exits 1 on any difference.
+//   kestrel-icu-probe at ZONE SECONDS
+//       ICU's offset and daylight time in ZONE at SECONDS since the epoch,
+//       with ICU's data version: what an ICU program on the device sees.
 
 #include <cstdio>
 #include <cstdlib>
@@ -24,7 +27,12 @@ int main(int argc, char** argv) {
   if (command == "check" && argc == 4) {
     return run_probe_check(argv[2], argv[3]) ? EXIT_SUCCESS : EXIT_FAILURE;
   }
-  (void)std::fputs("usage: kestrel-icu-probe ids | check RELEASE ZONEINFO\n",
-                   stderr);
+  if (command == "at" && argc == 4) {
+    return print_offset(argv[2], argv[3]) ? EXIT_SUCCESS : EXIT_FAILURE;
+  }
+  (void)std::fputs(
+      "usage: kestrel-icu-probe ids | check RELEASE ZONEINFO | at ZONE "
+      "SECONDS\n",
+      stderr);
   return 2;
 }

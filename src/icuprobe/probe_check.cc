@@ -25,6 +25,21 @@ std::vector<std::string> unresolved_ids() {
 
 }  // namespace
 
+bool print_offset(const std::string& zone, const std::string& seconds) {
+  const icu_zone icu(zone);
+  char* end = nullptr;
+  const long long instant = std::strtoll(seconds.c_str(), &end, 10);
+  if (!icu.known() || seconds.empty() || *end != '\0') {
+    (void)std::fprintf(stderr, "kestrel-icu-probe: cannot read %s at %s\n",
+                       zone.c_str(), seconds.c_str());
+    return false;
+  }
+  (void)std::printf("%s %s (ICU tz %s)\n", zone.c_str(),
+                    describe_offset(icu.at(instant)).c_str(),
+                    icu_zone::data_version().c_str());
+  return true;
+}
+
 bool run_probe_check(const std::string& release, const std::string& zoneinfo) {
   (void)setenv("TZDIR", zoneinfo.c_str(), 1);
   const std::string version = icu_zone::data_version();

@@ -11,17 +11,6 @@
 
 namespace {
 
-std::string describe(const local_offset& offset) {
-  const std::int64_t minutes = offset.seconds / 60;
-  const std::int64_t whole = minutes < 0 ? -minutes : minutes;
-  char text[32];
-  (void)std::snprintf(
-      text, sizeof text, "%c%02lld:%02lld%s", minutes < 0 ? '-' : '+',
-      static_cast<long long>(whole / 60), static_cast<long long>(whole % 60),
-      offset.daylight ? " daylight" : "");
-  return text;
-}
-
 std::string utc_text(std::int64_t instant) {
   const std::time_t t = instant;
   std::tm utc{};
@@ -67,8 +56,8 @@ zone_comparison::zone_comparison(const std::string& name,
       continue;
     }
     if (disagreements++ == 0) {
-      first = "at " + utc_text(instant) + " ICU " + describe(by_icu) +
-              ", glibc " + describe(by_glibc);
+      first = "at " + utc_text(instant) + " ICU " + describe_offset(by_icu) +
+              ", glibc " + describe_offset(by_glibc);
     }
   }
 }
