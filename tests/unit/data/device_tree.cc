@@ -45,6 +45,14 @@ std::map<std::string, std::string> snapshot(const std::string& root) {
   return entries;
 }
 
+std::map<std::string, std::string> relative_snapshot(const std::string& root) {
+  std::map<std::string, std::string> relative;
+  for (const auto& [path, what] : snapshot(root)) {
+    relative[path.substr(root.size())] = what;
+  }
+  return relative;
+}
+
 void make_device(const std::string& system_release,
                  const std::string& system_schema) {
   tree::write_file("/usr/share/zoneinfo.default/+VERSION",

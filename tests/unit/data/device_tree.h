@@ -9,6 +9,9 @@
 // under root changed but times.
 std::map<std::string, std::string> snapshot(const std::string& root);
 
+// The same with paths relative to root, for comparing two trees.
+std::map<std::string, std::string> relative_snapshot(const std::string& root);
+
 // The private device of a test: the system partition's release and ICU
 // schema, and the zoneinfo link at the system partition.
 void make_device(const std::string& system_release,

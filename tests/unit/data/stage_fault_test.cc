@@ -40,14 +40,6 @@ void fresh_device() {
   make_device("2025b");
 }
 
-std::map<std::string, std::string> relative(const std::string& root) {
-  std::map<std::string, std::string> out;
-  for (const auto& [path, what] : snapshot(root)) {
-    out[path.substr(root.size())] = what;
-  }
-  return out;
-}
-
 // How many times staging makes each changing call.
 std::map<std::string, int> call_counts() {
   fresh_device();
@@ -103,7 +95,7 @@ void expect_no_partial_set() {
   for (const std::string& name : {std::string("2026a.1.1")}) {
     const std::string path = "/var/db/timezone/tz/" + name;
     if (tree::present(path)) {
-      EXPECT_EQ(relative(path), relative(kSet)) << path;
+      EXPECT_EQ(relative_snapshot(path), relative_snapshot(kSet)) << path;
     }
   }
   const std::string latest = tree::link_target("/var/db/timezone/tz_latest");

@@ -37,20 +37,11 @@ std::map<std::string, std::string> whole_device() {
   return all;
 }
 
-// The set's entries, relative to its root.
-std::map<std::string, std::string> relative(const std::string& root) {
-  std::map<std::string, std::string> out;
-  for (const auto& [path, what] : snapshot(root)) {
-    out[path.substr(root.size())] = what;
-  }
-  return out;
-}
-
 TEST_F(stage_test, installs_the_set_and_points_tz_latest_at_it) {
   make_device("2025b");
   EXPECT_EQ(stage_set(load_set(kSet)), kStaged1);
   EXPECT_EQ(tree::link_target("/var/db/timezone/tz_latest"), kStaged1);
-  EXPECT_EQ(relative(kStaged1), relative(kSet));
+  EXPECT_EQ(relative_snapshot(kStaged1), relative_snapshot(kSet));
   // kestrel's own links are left for kestrel.
   EXPECT_EQ(tree::link_target("/var/db/timezone/zoneinfo"),
             "/usr/share/zoneinfo.default");
@@ -95,7 +86,7 @@ TEST_F(stage_test, stages_a_packed_archive) {
   const scratch_dir dir;
   write_set_archive(load_set(kSet), dir / "set.tgz");
   EXPECT_EQ(stage_set(load_set(dir / "set.tgz")), kStaged1);
-  EXPECT_EQ(relative(kStaged1), relative(kSet));
+  EXPECT_EQ(relative_snapshot(kStaged1), relative_snapshot(kSet));
 }
 
 // Each refusal: how the device is made, what is staged, what the message
