@@ -20,19 +20,23 @@ const std::vector<tz_rule>& rules_named(const tz_source& source,
   return found->second;
 }
 
-// The raw offset and saving of a time with the given saving. ICU has no
+// The raw offset and saving from the instant at (UT) on, under a line of
+// standard offset stdoff following rules with the given saving. ICU has no
 // negative saving: a negative one (the main form's winter time) is part of
-// the raw offset, and while a rule set still has negative savings ahead,
-// its other times count as daylight saving above that lower raw offset, as
-// the rearguard form writes them.
-zone_offset split(int stdoff, int save, int year,
+// the raw offset, and while the rule set has a negative saving still to
+// come, the times between count as daylight saving above that lower raw
+// offset, as the rearguard form writes them.
+zone_offset split(int stdoff, int save, int64_t at,
                   const std::vector<tz_rule>* rules) {
   if (save < 0) return {stdoff + save, 0};
   int lowest = 0;
   if (rules != nullptr) {
+    const int year = year_of(at);
     for (const tz_rule& rule : *rules) {
-      if (rule.save < lowest && (rule.to_max || rule.to >= year))
-        lowest = rule.save;
+      const bool to_come =
+          rule.to_max || rule.to > year ||
+          (rule.to == year && local_seconds(year, rule.at) - stdoff > at);
+      if (rule.save < lowest && to_come) lowest = rule.save;
     }
   }
   return {stdoff + lowest, save - lowest};
@@ -107,7 +111,10 @@ compiled_zone compile_zone(const tz_source& source,
             era, rules, use_start ? std::optional(start_time) : std::nullopt);
         if (zone.final) last_year = zone.final->year - 1;
       }
-      if (!use_start) zone.initial = split(stdoff, 0, first_year, &rules);
+      if (!use_start) {
+        zone.initial =
+            split(stdoff, 0, local_seconds(first_year, tz_day_time{}), &rules);
+      }
       int start_save = 0;
       std::vector<bool> done(rules.size());
       for (int year = first_year; year <= last_year; ++year) {
@@ -143,7 +150,7 @@ compiled_zone compile_zone(const tz_source& source,
             start_save = save;
             continue;
           }
-          list.push_back({change, split(stdoff, save, year, &rules)});
+          list.push_back({change, split(stdoff, save, change, &rules)});
         }
       }
       if (use_start) {

@@ -81,8 +81,12 @@ zoneinfo64_data build_zoneinfo64(std::string_view zic_text,
   for (const auto& [name, eras] : compat.zones) {
     if (!source.links.contains(name)) source.zones.try_emplace(name, eras);
   }
+  // A compatibility ID whose zone the release lacks is left out.
   for (const auto& [name, target] : compat.links) {
-    if (!source.zones.contains(name)) source.links.try_emplace(name, target);
+    const bool known =
+        source.zones.contains(target) || source.links.contains(target);
+    if (known && !source.zones.contains(name))
+      source.links.try_emplace(name, target);
   }
   const auto countries = read_zone_tab(zone_tab);
 
