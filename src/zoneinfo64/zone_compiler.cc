@@ -21,12 +21,13 @@ const std::vector<tz_rule>& rules_named(const tz_source& source,
 }
 
 // The raw offset and saving from the instant at (UT) on, under a line of
-// standard offset stdoff following rules with the given saving. ICU has no
-// negative saving: a negative one (the main form's winter time) is part of
-// the raw offset, and while the rule set has a negative saving still to
-// come, the times between count as daylight saving above that lower raw
-// offset, as the rearguard form writes them.
-zone_offset split(int stdoff, int save, int64_t at,
+// standard offset stdoff following rules with the given saving, the line
+// lasting until the end of last_year. ICU has no negative saving: a
+// negative one (the main form's winter time) is part of the raw offset, and
+// while the line has a negative saving still to come, the times between
+// count as daylight saving above that lower raw offset, as the rearguard
+// form writes them.
+zone_offset split(int stdoff, int save, int64_t at, int last_year,
                   const std::vector<tz_rule>* rules) {
   if (save < 0) return {stdoff + save, 0};
   int lowest = 0;
@@ -34,8 +35,9 @@ zone_offset split(int stdoff, int save, int64_t at,
     const int year = year_of(at);
     for (const tz_rule& rule : *rules) {
       const bool to_come =
-          rule.to_max || rule.to > year ||
-          (rule.to == year && local_seconds(year, rule.at) - stdoff > at);
+          rule.from <= last_year &&
+          (rule.to_max || rule.to > year ||
+           (rule.to == year && local_seconds(year, rule.at) - stdoff > at));
       if (rule.save < lowest && to_come) lowest = rule.save;
     }
   }
@@ -90,7 +92,7 @@ compiled_zone compile_zone(const tz_source& source,
     const int stdoff = era.stdoff;
     if (era.rules.empty()) {
       save = era.save;
-      const zone_offset offset = split(stdoff, save, 0, nullptr);
+      const zone_offset offset = split(stdoff, save, 0, 0, nullptr);
       if (use_start) {
         list.push_back({start_time, offset});
       } else {
@@ -100,6 +102,7 @@ compiled_zone compile_zone(const tz_source& source,
       const std::vector<tz_rule>& rules = rules_named(source, era.rules);
       int first_year = INT_MAX;
       int last_year = INT_MIN;
+      const int era_end = use_until ? era.until_year : INT_MAX;
       for (const tz_rule& rule : rules) {
         first_year = std::min(first_year, rule.from);
         last_year = std::max(last_year, rule.to_max ? rule.from + 1 : rule.to);
@@ -113,7 +116,8 @@ compiled_zone compile_zone(const tz_source& source,
       }
       if (!use_start) {
         zone.initial =
-            split(stdoff, 0, local_seconds(first_year, tz_day_time{}), &rules);
+            split(stdoff, 0, local_seconds(first_year, tz_day_time{}), era_end,
+                  &rules);
       }
       int start_save = 0;
       std::vector<bool> done(rules.size());
@@ -150,12 +154,13 @@ compiled_zone compile_zone(const tz_source& source,
             start_save = save;
             continue;
           }
-          list.push_back({change, split(stdoff, save, change, &rules)});
+          list.push_back(
+              {change, split(stdoff, save, change, era_end, &rules)});
         }
       }
       if (use_start) {
-        list.push_back({start_time, split(stdoff, start_save,
-                                          year_of(start_time), &rules)});
+        list.push_back({start_time, split(stdoff, start_save, start_time,
+                                          era_end, &rules)});
       }
     }
     if (use_until) {
