@@ -68,6 +68,22 @@ std::string region_of(const tz_source& source, const country_map& countries,
   return of_zone != countries.end() ? of_zone->second : "001";
 }
 
+// Refuses a name that ICU's text format could not carry as written: zone
+// names are written in strings and comments, rule names and the version as
+// resource keys and strings. The tz data's names use only these characters.
+void check_name(const std::string& name, std::string_view allowed,
+                const char* what) {
+  const bool plain =
+      !name.empty() && std::all_of(name.begin(), name.end(), [&](char c) {
+        return (c >= 'A' && c <= 'Z') || (c >= 'a' && c <= 'z') ||
+               (c >= '0' && c <= '9') ||
+               allowed.find(c) != std::string_view::npos;
+      });
+  if (!plain)
+    throw std::runtime_error(std::string(what) + " \"" + name +
+                             "\" has characters ICU IDs do not use");
+}
+
 }  // namespace
 
 zoneinfo64_data build_zoneinfo64(std::string_view zic_text,
@@ -91,11 +107,13 @@ zoneinfo64_data build_zoneinfo64(std::string_view zic_text,
   const auto countries = read_zone_tab(zone_tab);
 
   zoneinfo64_data data;
+  check_name(version, "._-", "version");
   data.version = version;
   std::map<std::string, int> index;
   for (const auto& entry : source.zones) index.emplace(entry.first, 0);
   for (const auto& entry : source.links) index.emplace(entry.first, 0);
   for (auto& [name, position] : index) {
+    check_name(name, "/_+-.", "zone name");
     position = static_cast<int>(data.names.size());
     data.names.push_back(name);
   }
@@ -119,6 +137,7 @@ zoneinfo64_data build_zoneinfo64(std::string_view zic_text,
       }
     }
     if (const auto& rule = data.zones[i].final) {
+      check_name(rule->name, "_-", "rule name");
       const auto [known, added] = data.rules.emplace(rule->name, rule->fields);
       if (!added && known->second != rule->fields) {
         throw std::runtime_error("rule " + rule->name +

@@ -105,6 +105,12 @@ TEST(zoneinfo64_data, bad_input_is_refused_with_the_line_or_name) {
       {"Zone A 1:00 - X\n\nZone A 2:00 - Y\n", "line 3: zone A defined twice"},
       {"Rule R 20 only - Jan 1 0 1:00 S\n", "line 1: bad FROM year"},
       {"Bogus line\n", "line 1: unknown line"},
+      {"Zone \"A*/B\" 1:00 - X\n",
+       "zone name \"A*/B\" has characters ICU IDs do not use"},
+      {"Rule \"R{\" 2000 max - Mar 1 0 1:00 S\nRule \"R{\" 2000 max - Oct 1 0 "
+       "0 -\n"
+       "Zone A 1:00 \"R{\" %s\n",
+       "rule name \"R{\" has characters"},
   };
   for (const auto& c : cases) {
     try {
