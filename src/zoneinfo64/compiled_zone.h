@@ -2,7 +2,6 @@
 #define KESTREL_ZONEINFO64_COMPILED_ZONE_H_
 
 #include <array>
-#include <compare>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -13,7 +12,10 @@
 struct zone_offset {
   int raw = 0;
   int dst = 0;
-  auto operator<=>(const zone_offset&) const = default;
+  bool operator==(const zone_offset&) const = default;
+  bool operator<(const zone_offset& other) const {
+    return raw != other.raw ? raw < other.raw : dst < other.dst;
+  }
 };
 
 struct zone_transition {

@@ -8,7 +8,7 @@
 
 int main(int argc, char** argv) {
   if (argc != 3) {
-    std::fputs("usage: kestrel-zoneinfo64 RELEASE-DIR OUT.txt\n", stderr);
+    (void)std::fputs("usage: kestrel-zoneinfo64 RELEASE-DIR OUT.txt\n", stderr);
     return 2;
   }
   try {
@@ -18,7 +18,7 @@ int main(int argc, char** argv) {
     out.close();
     if (!out) throw std::runtime_error(std::string("cannot write ") + argv[2]);
   } catch (const std::runtime_error& error) {
-    std::fprintf(stderr, "kestrel-zoneinfo64: %s\n", error.what());
+    (void)std::fprintf(stderr, "kestrel-zoneinfo64: %s\n", error.what());
     return 1;
   }
   return 0;

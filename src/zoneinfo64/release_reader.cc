@@ -48,6 +48,7 @@ std::string run_ziguard(const std::string& dir) {
                                     dir + "/ziguard.awk"};
   for (const char* file : kDataFiles) words.push_back(dir + "/" + file);
   std::vector<char*> argv;
+  argv.reserve(words.size() + 1);
   for (std::string& word : words) argv.push_back(word.data());
   argv.push_back(nullptr);
   std::array<int, 2> pipe_ends{};

@@ -82,13 +82,15 @@ std::string write_zoneinfo64(const zoneinfo64_data& data) {
     const std::string tag = "  /* " + data.names[i] + " */ ";
     const std::string number = " //Z#" + std::to_string(i) + "\n";
     if (data.alias_of[i] >= 0) {
-      out += tag + ":int { " + std::to_string(data.alias_of[i]) + " }" + number;
+      out.append(tag).append(":int { ").append(
+          std::to_string(data.alias_of[i]));
+      out.append(" }").append(number);
       continue;
     }
     if (!links[i].empty())
       links[i].insert(links[i].begin(), static_cast<int64_t>(i));
     std::sort(links[i].begin(), links[i].end());
-    out += tag + ":table {\n";
+    out.append(tag).append(":table {\n");
     write_zone(out, data.zones[i], links[i]);
     out += "  }" + number;
   }
