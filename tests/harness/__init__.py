@@ -1,0 +1,3 @@
+"""kestrel's test harness: the device layout, device trees, the device
+sandbox, strace traces, the message catalogue and the device states, and the
+runners and checks built on them (see README.md)."""
