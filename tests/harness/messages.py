@@ -4,13 +4,12 @@ read from its sources, and patterns that find them in text."""
 import os
 import re
 
+from . import SOURCE
+
 WARN_CALL = re.compile(r'\bwarn\(\s*((?:"(?:[^"\\]|\\.)*"\s*)+)', re.S)
 STRING = re.compile(r'"((?:[^"\\]|\\.)*)"')
 CONVERSION = re.compile(r"(%s|%d)")
-SOURCES = os.path.join(
-    os.path.dirname(os.path.dirname(os.path.dirname(os.path.abspath(__file__)))),
-    "src",
-)
+SOURCES = os.path.join(SOURCE, "src")
 
 
 def formats(source_dir=SOURCES):

@@ -6,7 +6,8 @@ import os
 import signal
 import subprocess
 
-SOURCE = os.path.dirname(os.path.dirname(os.path.dirname(os.path.abspath(__file__))))
+from . import SOURCE
+
 SANDBOX = os.path.join(SOURCE, "tools", "device-sandbox")
 
 

@@ -5,6 +5,7 @@ and the tree after."""
 import os
 import re
 
+from . import SOURCE
 from . import tree as trees
 
 SECTIONS = ("before", "arguments", "stderr", "exit", "after", "memory")
@@ -13,9 +14,7 @@ QUOTED = re.compile(r'"(?:[^"\\]|\\.)*"')
 REPEAT = re.compile(r"\s*\*\s*([0-9]+)(Ki|Mi)?")
 PLUS = re.compile(r"\s*\+\s*")
 RANGE = re.compile(r"\{([0-9]+)\.\.([0-9]+)\}")
-SCENARIOS = os.path.join(
-    os.path.dirname(os.path.dirname(os.path.abspath(__file__))), "scenarios"
-)
+SCENARIOS = os.path.join(SOURCE, "tests", "scenarios")
 
 
 class ScenarioError(Exception):

@@ -6,11 +6,14 @@ import shutil
 import subprocess
 import time
 
-import boot
-import check
-import device
-import image
-import states
+from .. import sandbox
+from .. import tree as trees
+from ..states import boot as states
+from . import check, image, qemu
+
+# The collector's instants: 2025-01-15 and 2025-07-15, 12:00 UTC.
+INSTANTS = ["1736942400", "1752580800"]
+SANDBOX_TIMEOUT = 60
 
 
 def packaged_kestrel(deb, work):
@@ -18,6 +21,23 @@ def packaged_kestrel(deb, work):
     shutil.rmtree(tree, ignore_errors=True)
     subprocess.run(["dpkg-deb", "-x", deb, tree], check=True)
     return os.path.join(tree, "usr/sbin/kestrel")
+
+
+def read_local_time(root):
+    """date and zdump of this machine, reading the device's links."""
+
+    def reader(*command):
+        return sandbox.reader(
+            root, command, capture_output=True, text=True, check=True
+        ).stdout.splitlines()
+
+    dates = []
+    for instant in INSTANTS:
+        dates += reader(
+            "env", "TZ=:/var/db/timezone/localtime", "date", "-d", "@" + instant, "+%Z%z"
+        )
+    zdump = reader("zdump", "-v", "-c", "2025,2026", "/var/db/timezone/localtime")
+    return dates, zdump
 
 
 def sandbox_runs(prepared, work, name, kestrel):
@@ -32,10 +52,14 @@ def sandbox_runs(prepared, work, name, kestrel):
     states.lay_out(root, name)
     runs = []
     for _ in range(2):
-        lines, status = device.run_kestrel(root, kestrel)
-        dates, zdump = device.read_local_time(root)
+        # A hang gives no lines and the status "timeout".
+        ran = sandbox.run_kestrel(root, kestrel, timeout=SANDBOX_TIMEOUT)
+        lines = [] if ran.timed_out else ran.lines()
+        status = "timeout" if ran.timed_out else ran.returncode
+        dates, zdump = read_local_time(root)
+        tree = trees.read(os.path.join(root, "var/db"), "var/db/")
         runs.append({"lines": lines, "status": status, "dates": dates,
-                     "zdump": zdump, "tree": device.tree_of_directory(root)})
+                     "zdump": zdump, "tree": tree})
     shutil.rmtree(root)
     return runs
 
@@ -71,12 +95,12 @@ def run_state(name, prepared, deb, work, log):
     for number, run in enumerate(runs, 1):
         boot_name = f"boot{number}"
         try:
-            results, seconds = boot.boot(root_image, prepared, work, boot_name)
-        except boot.boot_failed as failure:
+            results, seconds = qemu.boot(root_image, prepared, work, boot_name)
+        except qemu.boot_failed as failure:
             wrong.append(f"{boot_name}: {failure}")
             break
         got = check.results(results)
-        tree = device.tree_of_tar(os.path.join(results, "var-db.tar"))
+        tree = trees.from_tar(os.path.join(results, "var-db.tar"), "var/db")
         row[boot_name] = seconds
         row["kestrel" + str(number)] = got.duration_ms()
         log(f"{name}: {boot_name} took {seconds:.0f} s, kestrel "
@@ -93,7 +117,7 @@ def run_state(name, prepared, deb, work, log):
         log(f"{name}: FAILED\n  " + "\n  ".join(wrong))
         for number in (1, 2):
             log(f"{name}: tail of boot{number}.serial.log:\n" +
-                boot.serial_tail(work, f"boot{number}"))
+                qemu.serial_tail(work, f"boot{number}"))
     else:
         row["result"] = "passed"
         os.remove(root_image)

@@ -5,6 +5,8 @@ returns the list of what is wrong."""
 import json
 import os
 
+from .. import tree as trees
+
 STARTING = "7d4958e842da4a758f6c1cdc7b36dcc5"  # systemd's "Starting ..." job
 # Ordinary services of the test system that read the local time.
 READERS = ["cron.service", "systemd-timesyncd.service"]
@@ -108,19 +110,24 @@ def finished_first(got):
 
 def tree_matches(tree, sandbox_tree, expected):
     wrong = []
+
+    def show(path, entry):
+        return "absent" if entry is None else trees.describe(path, entry)
+
     for path in sorted(set(tree) | set(sandbox_tree)):
         if tree.get(path) != sandbox_tree.get(path):
-            wrong.append(f"{path}: booted {tree.get(path)}, "
-                         f"sandbox {sandbox_tree.get(path)}")
+            wrong.append(f"booted {show(path, tree.get(path))}, "
+                         f"sandbox {show(path, sandbox_tree.get(path))}")
     for path, target in expected["links"].items():
         if tree.get(path) != ("link", target):
-            wrong.append(f"{path}: {tree.get(path)}, expected link to {target}")
+            wrong.append(f"{show(path, tree.get(path))}, expected link to {target}")
     for path, content in expected["files"].items():
-        if (tree.get(path) or ("",))[:2] != ("file", repr(content)):
-            wrong.append(f"{path}: {tree.get(path)}, expected {content!r}")
+        entry = tree.get(path)
+        if entry is None or entry[0] != "file" or entry[2] != content:
+            wrong.append(f"{show(path, entry)}, expected {content!r}")
     for path in expected["absent"]:
         if path in tree:
-            wrong.append(f"{path}: {tree[path]}, expected absent")
+            wrong.append(f"{show(path, tree[path])}, expected absent")
     return wrong
 
 

@@ -5,7 +5,7 @@ import glob
 import os
 import subprocess
 
-SOURCE = os.path.join(os.path.dirname(os.path.abspath(__file__)), "../..")
+from .. import SOURCE
 
 
 def find(directory):

@@ -7,7 +7,7 @@ import shutil
 import subprocess
 import time
 
-import image
+from . import image
 
 BOOT_TIMEOUT = 600
 RESULTS_SIZE = "64M"
