@@ -39,7 +39,9 @@ def main():
     formats = messages.formats()
     text = section(page, "DIAGNOSTICS")
     if not formats or not text:
-        print(f"found {len(formats)} warnings and {len(text)} characters of DIAGNOSTICS")
+        print(
+            f"found {len(formats)} warnings and {len(text)} characters of DIAGNOSTICS"
+        )
         return 1
     missing = [
         format_string

@@ -18,7 +18,10 @@ def constants(file_name):
     """The sources' char-array constants: kZoneinfoLink -> ZONEINFO_LINK."""
     with open(os.path.join(messages.SOURCES, file_name)) as source:
         found = CONSTANT.findall(source.read())
-    return {re.sub(r"(?<!^)(?=[A-Z])", "_", name[1:]).upper(): value for name, value in found}
+    return {
+        re.sub(r"(?<!^)(?=[A-Z])", "_", name[1:]).upper(): value
+        for name, value in found
+    }
 
 
 def main():
@@ -26,21 +29,33 @@ def main():
     wrong = []
     for name, value in paths.items():
         if getattr(layout, name, None) != value:
-            wrong.append(f"{name}: paths.h {value!r}, harness {getattr(layout, name, None)!r}")
+            wrong.append(
+                f"{name}: paths.h {value!r}, harness {getattr(layout, name, None)!r}"
+            )
     derived = {"ICU_FORMAT_FILE"}
     extra = [
         name
         for name, value in vars(layout).items()
-        if name.isupper() and isinstance(value, str) and value.startswith("/")
-        and name not in paths and name not in derived
+        if name.isupper()
+        and isinstance(value, str)
+        and value.startswith("/")
+        and name not in paths
+        and name not in derived
     ]
-    wrong += [f"{name}: a fixed path of the harness that paths.h lacks" for name in extra]
+    wrong += [
+        f"{name}: a fixed path of the harness that paths.h lacks" for name in extra
+    ]
     default_zone = constants("driver/localtime_link.cc").get("DEFAULT_ZONE")
     if default_zone != layout.DEFAULT_ZONE:
-        wrong.append(f"default zone: kestrel {default_zone!r}, harness {layout.DEFAULT_ZONE!r}")
+        wrong.append(
+            f"default zone: kestrel {default_zone!r}, harness {layout.DEFAULT_ZONE!r}"
+        )
     format_file = constants("dataset/kal_icu.cc").get("FORMAT_FILE")
     if f"{layout.SYSTEM_ICU}/{format_file}" != layout.ICU_FORMAT_FILE:
-        wrong.append(f"ICU format file: kestrel {format_file!r}, harness {layout.ICU_FORMAT_FILE!r}")
+        wrong.append(
+            f"ICU format file: kestrel {format_file!r}, "
+            f"harness {layout.ICU_FORMAT_FILE!r}"
+        )
     for line in wrong:
         print(line)
     print(f"{len(paths)} fixed paths compared; {len(wrong)} differences")

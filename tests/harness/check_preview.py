@@ -24,7 +24,11 @@ def stamps(root):
     for directory, dirs, files in os.walk(root):
         for name in dirs + files:
             info = os.lstat(os.path.join(directory, name))
-            found[os.path.join(directory, name)] = (info.st_uid, info.st_gid, info.st_mtime_ns)
+            found[os.path.join(directory, name)] = (
+                info.st_uid,
+                info.st_gid,
+                info.st_mtime_ns,
+            )
     return found
 
 
@@ -49,8 +53,12 @@ def main():
     device.sample(sample)
     before, before_stamps = trees.read(sample, "/"), stamps(sample)
 
-    shown = sandbox.reader(sample, [preview, "--kestrel", os.path.abspath(kestrel)],
-                           capture_output=True, text=True)
+    shown = sandbox.reader(
+        sample,
+        [preview, "--kestrel", os.path.abspath(kestrel)],
+        capture_output=True,
+        text=True,
+    )
     print(shown.stdout, shown.stderr, sep="")
     if shown.returncode != 0:
         print(f"kestrel-preview exited with {shown.returncode}")
@@ -80,7 +88,9 @@ def main():
 
     listed = {
         line.split()[1].rstrip(":"): line
-        for line in section(lines, "changes under /var/db:", lambda line: line == "exit:")
+        for line in section(
+            lines, "changes under /var/db:", lambda line: line == "exit:"
+        )
     }
     if set(listed) != set(done):
         print(f"FAILED: preview lists {sorted(listed)}, kestrel changed {sorted(done)}")
@@ -94,7 +104,11 @@ def main():
     if not done:
         print("FAILED: the sample device should need changes")
         failed = True
-    print("FAILED" if failed else f"preview matched kestrel's {len(done)} changes; device unchanged")
+    print(
+        "FAILED"
+        if failed
+        else f"preview matched kestrel's {len(done)} changes; device unchanged"
+    )
     return 1 if failed else 0
 
 

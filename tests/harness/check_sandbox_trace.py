@@ -111,7 +111,9 @@ def traced_scenario(scenario, kestrel):
 
 
 def under(path, roots):
-    return any(path == root or path.startswith(root.rstrip("/") + "/") for root in roots)
+    return any(
+        path == root or path.startswith(root.rstrip("/") + "/") for root in roots
+    )
 
 
 def problems(calls, allowed, writable):
@@ -144,9 +146,7 @@ def main():
     unit, kestrel = sys.argv[1:3]
     scenarios = sys.argv[3:]
     directives = unit_directives(unit)
-    allowed = allowed_syscalls(
-        directives.get("SystemCallFilter", []), syscall_groups()
-    )
+    allowed = allowed_syscalls(directives.get("SystemCallFilter", []), syscall_groups())
     writable = [
         p.lstrip("-+") for v in directives.get("ReadWritePaths", []) for p in v.split()
     ]

@@ -259,5 +259,7 @@ def compare_windows(file_name, windows, names):
     if not new and not gone:
         print(f"the windows are the {len(expected)} listed in {file_name}")
     return new + gone
+
+
 if __name__ == "__main__":
     sys.exit(main())

@@ -68,7 +68,9 @@ def main():
     show_device(root, "the sample device before kestrel runs")
     local_time(root, "local time a program on the device sees now")
     print("== kestrel runs; its warning lines:", flush=True)
-    status = subprocess.run([sandbox.SANDBOX, root, kestrel], stderr=subprocess.STDOUT).returncode
+    status = subprocess.run(
+        [sandbox.SANDBOX, root, kestrel], stderr=subprocess.STDOUT
+    ).returncode
     print(f"(exit status {status})\n")
     show_device(root, "the sample device after kestrel ran")
     local_time(root, "local time a program on the device sees after the run")

@@ -74,7 +74,9 @@ def stage(root, version, word, source=None, zone_source=None):
 def sample(root, zone=layout.SAMPLE_ZONE):
     """The sample device (sample/make-device), made anew in root."""
     if not os.path.isfile(os.path.join(MACHINE_ZONEINFO, "tzdata.zi")):
-        raise SystemExit(f"make-device: no {MACHINE_ZONEINFO}/tzdata.zi (is tzdata installed?)")
+        raise SystemExit(
+            f"make-device: no {MACHINE_ZONEINFO}/tzdata.zi (is tzdata installed?)"
+        )
     if not os.path.isfile(os.path.join(MACHINE_ZONEINFO, zone)):
         raise SystemExit(f"make-device: no zone {zone} in {MACHINE_ZONEINFO}")
     shutil.rmtree(root, ignore_errors=True)

@@ -34,9 +34,7 @@ from .states import faults as fault_states
 
 ERRNOS = ("EACCES", "EIO", "EROFS", "ENOSPC", "ENOMEM", "ELOOP", "ENAMETOOLONG")
 
-RESET_IN_OUTER_GUARD = (
-    "kestrel: Unable to locate data; resetting to system partition: "
-)
+RESET_IN_OUTER_GUARD = "kestrel: Unable to locate data; resetting to system partition: "
 DEFAULT_LOCALTIME = (
     f"kestrel: localtime link invalid; resetting to {layout.DEFAULT_ZONE}: "
 )

@@ -50,6 +50,5 @@ def zone_link_target(zone):
 # What a run of kestrel may change, below the device root: the three links
 # every program reads, and the records beside them.
 DEVICE_LINKS = tuple(map(rel, (ZONEINFO_LINK, ICUTZ_LINK, LOCALTIME_LINK)))
-DEVICE_RECORDS = tuple(map(rel, (VERSION_RECORD, NEEDS_CLEANUP,
-                                 LEGACY_ICUTZ_LINK)))
+DEVICE_RECORDS = tuple(map(rel, (VERSION_RECORD, NEEDS_CLEANUP, LEGACY_ICUTZ_LINK)))
 STAGED = rel(STAGED_DIR)

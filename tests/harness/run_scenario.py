@@ -136,7 +136,9 @@ def main():
     parser.add_argument("scenario")
     options = parser.parse_args()
     try:
-        passed = run(options.scenario, os.path.abspath(options.kestrel), options.timeout)
+        passed = run(
+            options.scenario, os.path.abspath(options.kestrel), options.timeout
+        )
     except scenario.ScenarioError as error:
         print(f"run-scenario: {error}")
         return 2

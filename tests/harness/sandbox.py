@@ -32,7 +32,7 @@ class Run:
 
 
 def describe_exit(returncode):
-    """"status N", "abort", "signal N", or "hang" for None."""
+    """ "status N", "abort", "signal N", or "hang" for None."""
     if returncode is None:
         return "hang"
     if returncode == -signal.SIGABRT:

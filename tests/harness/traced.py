@@ -66,12 +66,12 @@ def record(state, tree, kestrel):
     """The run without faults, every file-system call of it recorded."""
     run = run_fresh(kestrel, tree, strace.recording_options())
     if run.returncode != 0 or run.trace is None or not run.trace.calls:
-        raise SystemExit(
-            f"{state}: the run without faults failed ({run.exit_text()})"
-        )
+        raise SystemExit(f"{state}: the run without faults failed ({run.exit_text()})")
     return run
 
 
 def outcome(tree, paths):
     """The entries of paths in a few words each."""
-    return {path: trees.show_entry(entry) for path, entry in trees.pick(tree, paths).items()}
+    return {
+        path: trees.show_entry(entry) for path, entry in trees.pick(tree, paths).items()
+    }

@@ -39,12 +39,15 @@ def lay_out_system_partition(root):
 
 
 def install_collector(root):
-    shutil.copy(os.path.join(GUEST, "kestrel-boot-collect"),
-                os.path.join(root, "usr/local/sbin/"))
-    shutil.copy(os.path.join(GUEST, "kestrel-boot-collect.service"),
-                os.path.join(root, "etc/systemd/system/"))
-    run("systemctl", "--root=" + root, "enable",
-        "kestrel-boot-collect.service")
+    shutil.copy(
+        os.path.join(GUEST, "kestrel-boot-collect"),
+        os.path.join(root, "usr/local/sbin/"),
+    )
+    shutil.copy(
+        os.path.join(GUEST, "kestrel-boot-collect.service"),
+        os.path.join(root, "etc/systemd/system/"),
+    )
+    run("systemctl", "--root=" + root, "enable", "kestrel-boot-collect.service")
 
 
 def prepare(base, root, deb):

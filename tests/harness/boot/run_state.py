@@ -34,7 +34,12 @@ def read_local_time(root):
     dates = []
     for instant in INSTANTS:
         dates += reader(
-            "env", "TZ=:/var/db/timezone/localtime", "date", "-d", "@" + instant, "+%Z%z"
+            "env",
+            "TZ=:/var/db/timezone/localtime",
+            "date",
+            "-d",
+            "@" + instant,
+            "+%Z%z",
         )
     zdump = reader("zdump", "-v", "-c", "2025,2026", "/var/db/timezone/localtime")
     return dates, zdump
@@ -47,8 +52,15 @@ def sandbox_runs(prepared, work, name, kestrel):
     shutil.rmtree(root, ignore_errors=True)
     os.makedirs(os.path.join(root, "usr/share"))
     for entry in ("zoneinfo.default", "icu"):
-        subprocess.run(["cp", "-al", os.path.join(prepared, "usr/share", entry),
-                        os.path.join(root, "usr/share")], check=True)
+        subprocess.run(
+            [
+                "cp",
+                "-al",
+                os.path.join(prepared, "usr/share", entry),
+                os.path.join(root, "usr/share"),
+            ],
+            check=True,
+        )
     states.lay_out(root, name)
     runs = []
     for _ in range(2):
@@ -58,39 +70,60 @@ def sandbox_runs(prepared, work, name, kestrel):
         status = "timeout" if ran.timed_out else ran.returncode
         dates, zdump = read_local_time(root)
         tree = trees.read(os.path.join(root, "var/db"), "var/db/")
-        runs.append({"lines": lines, "status": status, "dates": dates,
-                     "zdump": zdump, "tree": tree})
+        runs.append(
+            {
+                "lines": lines,
+                "status": status,
+                "dates": dates,
+                "zdump": zdump,
+                "tree": tree,
+            }
+        )
     shutil.rmtree(root)
     return runs
 
 
 def links_and_record(tree):
-    return {path: entry for path, entry in tree.items()
-            if entry[0] == "link" or path.endswith("/TZVersionDiffRecord")}
+    return {
+        path: entry
+        for path, entry in tree.items()
+        if entry[0] == "link" or path.endswith("/TZVersionDiffRecord")
+    }
 
 
 def check_boot(got, run, expected, tree):
-    return (check.unit_ran_once(got) +
-            check.warnings_match(got, run["lines"], expected["warnings"]) +
-            check.finished_first(got) +
-            check.tree_matches(tree, run["tree"], expected) +
-            check.local_time_matches(got, run["dates"], run["zdump"], expected))
+    return (
+        check.unit_ran_once(got)
+        + check.warnings_match(got, run["lines"], expected["warnings"])
+        + check.finished_first(got)
+        + check.tree_matches(tree, run["tree"], expected)
+        + check.local_time_matches(got, run["dates"], run["zdump"], expected)
+    )
 
 
 def run_state(name, prepared, deb, work, log):
     work = os.path.join(work, "states", name)
     shutil.rmtree(work, ignore_errors=True)
     os.makedirs(work)
-    row = {"name": name, "image": 0, "boot1": 0, "boot2": 0,
-           "kestrel1": 0, "kestrel2": 0, "result": "FAILED"}
+    row = {
+        "name": name,
+        "image": 0,
+        "boot1": 0,
+        "boot2": 0,
+        "kestrel1": 0,
+        "kestrel2": 0,
+        "result": "FAILED",
+    }
     started = time.monotonic()
     root_image, expected = image.state_image(prepared, work, name)
     row["image"] = time.monotonic() - started
     runs = sandbox_runs(prepared, work, name, packaged_kestrel(deb, work))
     for number, run in enumerate(runs, 1):
         if run["status"] != 0:
-            log(f"{name}: the device sandbox's run {number} ended with "
-                f"{run['status']} {run['lines']}")
+            log(
+                f"{name}: the device sandbox's run {number} ended with "
+                f"{run['status']} {run['lines']}"
+            )
     wrong, trees = [], []
     for number, run in enumerate(runs, 1):
         boot_name = f"boot{number}"
@@ -103,21 +136,27 @@ def run_state(name, prepared, deb, work, log):
         tree = trees.from_tar(os.path.join(results, "var-db.tar"), "var/db")
         row[boot_name] = seconds
         row["kestrel" + str(number)] = got.duration_ms()
-        log(f"{name}: {boot_name} took {seconds:.0f} s, kestrel "
-            f"{got.duration_ms():.1f} ms, lines {got.warnings()}")
+        log(
+            f"{name}: {boot_name} took {seconds:.0f} s, kestrel "
+            f"{got.duration_ms():.1f} ms, lines {got.warnings()}"
+        )
         if number == 2:
             expected = dict(expected, warnings=None, files={}, absent=[])
             if links_and_record(tree) != links_and_record(trees[0]):
-                wrong.append("boot2: the second boot changed the links or "
-                             "the record")
-        wrong += [f"{boot_name}: {text}"
-                  for text in check_boot(got, run, expected, tree)]
+                wrong.append(
+                    "boot2: the second boot changed the links or " "the record"
+                )
+        wrong += [
+            f"{boot_name}: {text}" for text in check_boot(got, run, expected, tree)
+        ]
         trees.append(tree)
     if wrong:
         log(f"{name}: FAILED\n  " + "\n  ".join(wrong))
         for number in (1, 2):
-            log(f"{name}: tail of boot{number}.serial.log:\n" +
-                qemu.serial_tail(work, f"boot{number}"))
+            log(
+                f"{name}: tail of boot{number}.serial.log:\n"
+                + qemu.serial_tail(work, f"boot{number}")
+            )
     else:
         row["result"] = "passed"
         os.remove(root_image)

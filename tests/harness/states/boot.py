@@ -21,7 +21,10 @@ def update_adopted(root, release):
     device.link(root, LATEST_LINK, update)
     device.link(root, LOCALTIME_LINK, layout.zone_link_target("Europe/Paris"))
     return {
-        "links": {R(ZONEINFO_LINK): update + "/zoneinfo", R(layout.ICUTZ_LINK): update + "/icutz"},
+        "links": {
+            R(ZONEINFO_LINK): update + "/zoneinfo",
+            R(layout.ICUTZ_LINK): update + "/icutz",
+        },
         "files": {R(layout.VERSION_RECORD): f"{release}.1.0_{release}.1.1".encode()},
         "absent": [R(layout.NEEDS_CLEANUP)],
         "warnings": [],
@@ -30,7 +33,9 @@ def update_adopted(root, release):
 
 
 def older_data_reset(root, release):
-    old = device.stage(root, "2000a.1.0", "2000a", zone_source="Zone Europe/Paris 0:30 - OLDT\n")
+    old = device.stage(
+        root, "2000a.1.0", "2000a", zone_source="Zone Europe/Paris 0:30 - OLDT\n"
+    )
     device.link(root, ZONEINFO_LINK, old + "/zoneinfo")
     device.link(root, layout.ICUTZ_LINK, old + "/icutz")
     device.link(root, LOCALTIME_LINK, layout.zone_link_target("Europe/Paris"))
