@@ -20,18 +20,15 @@ ones listed in FILE (one "STATE LEVEL kill before ACTION" per line); any
 difference is printed as the lines to add or remove, and fails.
 """
 
-import argparse
 import collections
 import concurrent.futures
-import os
 import shutil
 import sys
 import tempfile
 import time
 
-from . import layout, states, strace, traced
+from . import layout, strace, traced
 from . import tree as trees
-from .states import faults as fault_states
 
 # Calls whose success always shows in the device tree.
 VISIBLE = {
@@ -95,8 +92,7 @@ class Point:
 
 
 def record(state, stem, kestrel):
-    tree = fault_states.tree(stem)
-    run = traced.record(state, tree, kestrel)
+    tree, run = traced.record(state, stem, kestrel)
     seen = collections.Counter()
     points = []
     for call in run.trace.calls:
@@ -139,14 +135,7 @@ def crash(point, kestrel):
 
 
 def main():
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--kestrel", required=True)
-    parser.add_argument("--jobs", type=int, default=2)
-    parser.add_argument("--state", action="append", default=[])
-    parser.add_argument("--windows")
-    options = parser.parse_args()
-    kestrel = os.path.abspath(options.kestrel)
-    chosen = states.select(fault_states.STATES, options.state)
+    options, kestrel, chosen = traced.command_line(__doc__, ("--windows", {}))
     started = time.monotonic()
 
     with concurrent.futures.ThreadPoolExecutor(options.jobs) as pool:

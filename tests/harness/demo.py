@@ -15,8 +15,8 @@ import sys
 from . import device, layout, sandbox
 from . import tree as trees
 
-ZONE_FILE_READ = """
-zone=$(readlink -m /var/db/timezone/localtime)
+ZONE_FILE_READ = f"""
+zone=$(readlink -m {layout.LOCALTIME_LINK})
 if [ -f "$zone" ]; then
   echo "zone file read: $zone"
 else

@@ -20,7 +20,6 @@ than after a run without faults; --outcomes writes every run's outcome to a
 file, so that two builds can be compared run by run.
 """
 
-import argparse
 import concurrent.futures
 import os
 import re
@@ -28,9 +27,8 @@ import signal
 import sys
 import time
 
-from . import layout, messages, states, strace, traced
+from . import layout, messages, strace, traced
 from . import tree as trees
-from .states import faults as fault_states
 
 ERRNOS = ("EACCES", "EIO", "EROFS", "ENOSPC", "ENOMEM", "ELOOP", "ENAMETOOLONG")
 
@@ -118,13 +116,14 @@ def judge(fault, run, tree):
     ]
     changed = trees.changed(tree, run.after, layout.STAGED)
     if changed:
-        defects.append("changed under var/db/timezone/tz: " + ", ".join(changed))
+        defects.append(
+            f"changed under {layout.STAGED.rstrip('/')}: " + ", ".join(changed)
+        )
     return defects
 
 
 def record(state, stem, kestrel):
-    tree = fault_states.tree(stem)
-    run = traced.record(state, tree, kestrel)
+    tree, run = traced.record(state, stem, kestrel)
     return tree, run, [call for call in run.trace.calls if strace.touches_files(call)]
 
 
@@ -135,15 +134,9 @@ def inject(fault, tree, kestrel):
 
 
 def main():
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--kestrel", required=True)
-    parser.add_argument("--jobs", type=int, default=2)
-    parser.add_argument("--state", action="append", default=[])
-    parser.add_argument("--costs", action="store_true")
-    parser.add_argument("--outcomes")
-    options = parser.parse_args()
-    kestrel = os.path.abspath(options.kestrel)
-    chosen = states.select(fault_states.STATES, options.state)
+    options, kestrel, chosen = traced.command_line(
+        __doc__, ("--costs", {"action": "store_true"}), ("--outcomes", {})
+    )
     started = time.monotonic()
 
     with concurrent.futures.ThreadPoolExecutor(options.jobs) as pool:

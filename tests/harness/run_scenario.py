@@ -114,7 +114,7 @@ def run(scenario_file, kestrel, timeout, env=None):
     ]
     if lost:
         print(
-            "changed or removed under var/db/timezone/tz: "
+            f"changed or removed under {layout.STAGED.rstrip('/')}: "
             + ", ".join(trees.show_path(path) for path in lost)
         )
         failed = True

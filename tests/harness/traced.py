@@ -1,12 +1,14 @@
 """kestrel run under strace in the device sandbox, on a device built fresh
 from a tree, for the fault matrix and the crash points."""
 
+import argparse
 import os
 import shutil
 import tempfile
 
-from . import sandbox, strace
+from . import sandbox, states, strace
 from . import tree as trees
+from .states import faults as fault_states
 
 TIMEOUT = 20  # seconds; a run takes a few hundredths
 
@@ -62,12 +64,14 @@ def run_fresh(kestrel, tree, strace_options=None):
         shutil.rmtree(scratch, ignore_errors=True)
 
 
-def record(state, tree, kestrel):
-    """The run without faults, every file-system call of it recorded."""
+def record(state, stem, kestrel):
+    """The state's tree (the before: tree of the scenario stem), and the run
+    on it without faults, every file-system call of it recorded."""
+    tree = fault_states.tree(stem)
     run = run_fresh(kestrel, tree, strace.recording_options())
     if run.returncode != 0 or run.trace is None or not run.trace.calls:
         raise SystemExit(f"{state}: the run without faults failed ({run.exit_text()})")
-    return run
+    return tree, run
 
 
 def outcome(tree, paths):
@@ -75,3 +79,18 @@ def outcome(tree, paths):
     return {
         path: trees.show_entry(entry) for path, entry in trees.pick(tree, paths).items()
     }
+
+
+def command_line(description, *extra):
+    """The options of a fault tool: the binary, the jobs, the states, and
+    extra, its own (flag, keyword arguments of add_argument) pairs. Returns
+    the options, the binary's absolute path and the chosen states."""
+    parser = argparse.ArgumentParser(description=description.splitlines()[0])
+    parser.add_argument("--kestrel", required=True)
+    parser.add_argument("--jobs", type=int, default=2)
+    parser.add_argument("--state", action="append", default=[])
+    for flag, keywords in extra:
+        parser.add_argument(flag, **keywords)
+    options = parser.parse_args()
+    chosen = states.select(fault_states.STATES, options.state)
+    return options, os.path.abspath(options.kestrel), chosen

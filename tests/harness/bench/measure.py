@@ -122,6 +122,13 @@ def instructions(binary, config, repeats):
     return counts
 
 
+def run_quietly(command):
+    """A measuring command, its output in its own report file."""
+    subprocess.run(
+        command, stdin=subprocess.DEVNULL, stderr=subprocess.DEVNULL, check=True
+    )
+
+
 def memory(binary, config, repeats, scratch):
     """Maximum resident set size in KiB and minor page faults, from GNU
     time's %M and %R."""
@@ -129,12 +136,7 @@ def memory(binary, config, repeats, scratch):
     figures = {"peak_rss_kib": [], "minor_faults": []}
     for _ in range(repeats):
         restore(config)
-        subprocess.run(
-            ["/usr/bin/time", "-f", "%M %R", "-o", report, binary],
-            stdin=subprocess.DEVNULL,
-            stderr=subprocess.DEVNULL,
-            check=True,
-        )
+        run_quietly(["/usr/bin/time", "-f", "%M %R", "-o", report, binary])
         with open(report) as data:
             peak, faults = data.read().split()[-2:]
         figures["peak_rss_kib"].append(int(peak))
@@ -146,12 +148,7 @@ def system_calls(binary, config, scratch):
     """strace -c's table of the program's own calls, from its execve on."""
     report = os.path.join(scratch, "strace")
     restore(config)
-    subprocess.run(
-        ["strace", "-f", "-c", "-o", report, binary],
-        stdin=subprocess.DEVNULL,
-        stderr=subprocess.DEVNULL,
-        check=True,
-    )
+    run_quietly(["strace", "-f", "-c", "-o", report, binary])
     by_name, total, errors = {}, 0, 0
     with open(report) as data:
         for line in data:

@@ -7,7 +7,7 @@ import os
 import shutil
 import subprocess
 
-from .. import SOURCE, device
+from .. import SOURCE, device, layout
 from ..states import boot as states
 
 GUEST = os.path.join(SOURCE, "tests", "boot", "guest")
@@ -35,7 +35,7 @@ def lay_out_system_partition(root):
     localtime = os.path.join(root, "etc/localtime")
     if os.path.lexists(localtime):
         os.remove(localtime)
-    os.symlink("/var/db/timezone/localtime", localtime)
+    os.symlink(layout.LOCALTIME_LINK, localtime)
 
 
 def install_collector(root):

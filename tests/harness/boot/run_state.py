@@ -6,7 +6,7 @@ import shutil
 import subprocess
 import time
 
-from .. import sandbox
+from .. import layout, sandbox
 from .. import tree as trees
 from ..states import boot as states
 from . import check, image, qemu
@@ -35,13 +35,13 @@ def read_local_time(root):
     for instant in INSTANTS:
         dates += reader(
             "env",
-            "TZ=:/var/db/timezone/localtime",
+            "TZ=:" + layout.LOCALTIME_LINK,
             "date",
             "-d",
             "@" + instant,
             "+%Z%z",
         )
-    zdump = reader("zdump", "-v", "-c", "2025,2026", "/var/db/timezone/localtime")
+    zdump = reader("zdump", "-v", "-c", "2025,2026", layout.LOCALTIME_LINK)
     return dates, zdump
 
 
@@ -51,14 +51,9 @@ def sandbox_runs(prepared, work, name, kestrel):
     root = os.path.join(work, "device")
     shutil.rmtree(root, ignore_errors=True)
     os.makedirs(os.path.join(root, "usr/share"))
-    for entry in ("zoneinfo.default", "icu"):
+    for entry in map(layout.rel, (layout.SYSTEM_ZONEINFO, layout.SYSTEM_ICU)):
         subprocess.run(
-            [
-                "cp",
-                "-al",
-                os.path.join(prepared, "usr/share", entry),
-                os.path.join(root, "usr/share"),
-            ],
+            ["cp", "-al", os.path.join(prepared, entry), os.path.join(root, entry)],
             check=True,
         )
     states.lay_out(root, name)
