@@ -58,26 +58,21 @@ class State:
         # staged data sets, and the links it rewrites are replaced, not
         # written through.
         subprocess.run(["cp", "-al", template, self.device], check=True)
-        self.relink("icutz", None)
-        self.relink("timezone/localtime", layout.zone_link_target(layout.SAMPLE_ZONE))
+        os.unlink(os.path.join(self.device, layout.rel(layout.LEGACY_ICUTZ_LINK)))
+        device.link(
+            self.device,
+            layout.LOCALTIME_LINK,
+            layout.zone_link_target(layout.SAMPLE_ZONE),
+        )
         self.shape()
         self.save()
 
-    def relink(self, entry, target):
-        path = os.path.join(self.var_db, entry)
-        if os.path.lexists(path):
-            os.unlink(path)
-        if target is not None:
-            os.symlink(target, path)
-
-    def write(self, entry, text):
-        with open(os.path.join(self.var_db, entry), "w") as out:
-            out.write(text)
-
     def make_update_current(self):
-        self.relink("timezone/zoneinfo", self.staged + "/zoneinfo")
-        self.relink("timezone/icutz", self.staged + "/icutz")
-        self.write("timezone/TZVersionDiffRecord", f"{self.release}.1.0_{self.update}")
+        device.link(self.device, layout.ZONEINFO_LINK, self.staged + "/zoneinfo")
+        device.link(self.device, layout.ICUTZ_LINK, self.staged + "/icutz")
+        device.write(
+            self.device, layout.VERSION_RECORD, f"{self.release}.1.0_{self.update}"
+        )
 
     def save(self):
         self.pristine = os.path.join(self.directory, "pristine")
