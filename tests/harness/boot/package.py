@@ -5,15 +5,17 @@ import glob
 import os
 import subprocess
 
-SOURCE = os.path.join(os.path.dirname(os.path.abspath(__file__)), "../..")
+from .. import SOURCE
 
 
 def find(directory):
     """The kestrel .deb in directory (not its debug-symbol package)."""
     debs = glob.glob(os.path.join(directory, "kestrel_*.deb"))
     if len(debs) != 1:
-        raise SystemExit(f"boot-test: expected one kestrel_*.deb in "
-                         f"{directory}, found {len(debs)}")
+        raise SystemExit(
+            f"boot-test: expected one kestrel_*.deb in "
+            f"{directory}, found {len(debs)}"
+        )
     return debs[0]
 
 
@@ -23,6 +25,10 @@ def build(work):
     out = os.path.join(work, "package")
     subprocess.run(["rm", "-rf", out], check=True)
     env = dict(os.environ, DEB_BUILD_OPTIONS="nocheck")
-    subprocess.run([os.path.join(SOURCE, "tools/build-package"), out],
-                   check=True, env=env, stdout=subprocess.DEVNULL)
+    subprocess.run(
+        [os.path.join(SOURCE, "tools/build-package"), out],
+        check=True,
+        env=env,
+        stdout=subprocess.DEVNULL,
+    )
     return find(out)

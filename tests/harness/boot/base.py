@@ -13,8 +13,15 @@ SUITE = "bookworm"
 # systemd boots it; tzdata is the data the system partition is made of;
 # cron and systemd-timesyncd are ordinary services that read the local time
 # and must start after kestrel has finished.
-PACKAGES = ["systemd", "systemd-sysv", "linux-image-amd64", "udev", "tzdata",
-            "cron", "systemd-timesyncd"]
+PACKAGES = [
+    "systemd",
+    "systemd-sysv",
+    "linux-image-amd64",
+    "udev",
+    "tzdata",
+    "cron",
+    "systemd-timesyncd",
+]
 
 
 def cache_key():
@@ -37,9 +44,18 @@ def base_tree(cache_dir, log):
     log(f"base system: mmdebstrap {SUITE} into {root}")
     started = time.monotonic()
     with open(root + ".log", "w") as out:
-        subprocess.run(["mmdebstrap", "--variant=apt",
-                        "--include=" + ",".join(PACKAGES), SUITE, scratch],
-                       stdout=out, stderr=subprocess.STDOUT, check=True)
+        subprocess.run(
+            [
+                "mmdebstrap",
+                "--variant=apt",
+                "--include=" + ",".join(PACKAGES),
+                SUITE,
+                scratch,
+            ],
+            stdout=out,
+            stderr=subprocess.STDOUT,
+            check=True,
+        )
     os.rename(scratch, root)
     log(f"base system: built in {time.monotonic() - started:.0f} s")
     return root

@@ -7,9 +7,10 @@ import os
 import shutil
 import subprocess
 
-import states
+from .. import SOURCE, device, layout
+from ..states import boot as states
 
-GUEST = os.path.join(os.path.dirname(os.path.abspath(__file__)), "guest")
+GUEST = os.path.join(SOURCE, "tests", "boot", "guest")
 IMAGE_SIZE = "2G"
 
 
@@ -30,29 +31,23 @@ def install_package(root, deb):
 def lay_out_system_partition(root):
     """The system partition made from the image's own tzdata, and the
     system's local time read through kestrel's links."""
-    share = os.path.join(root, "usr/share")
-    run("cp", "-a", os.path.join(share, "zoneinfo"),
-        os.path.join(share, "zoneinfo.default"))
-    with open(os.path.join(share, "zoneinfo/tzdata.zi")) as zi:
-        release = zi.readline().split()[-1]
-    with open(os.path.join(share, "zoneinfo.default/+VERSION"), "w") as out:
-        out.write(release + "\n")
-    os.makedirs(os.path.join(share, "icu"), exist_ok=True)
-    with open(os.path.join(share, "icu/icutzformat.txt"), "w") as out:
-        out.write(states.SCHEMA + "\n")
+    device.system_partition(root, os.path.join(root, "usr/share/zoneinfo"))
     localtime = os.path.join(root, "etc/localtime")
     if os.path.lexists(localtime):
         os.remove(localtime)
-    os.symlink("/var/db/timezone/localtime", localtime)
+    os.symlink(layout.LOCALTIME_LINK, localtime)
 
 
 def install_collector(root):
-    shutil.copy(os.path.join(GUEST, "kestrel-boot-collect"),
-                os.path.join(root, "usr/local/sbin/"))
-    shutil.copy(os.path.join(GUEST, "kestrel-boot-collect.service"),
-                os.path.join(root, "etc/systemd/system/"))
-    run("systemctl", "--root=" + root, "enable",
-        "kestrel-boot-collect.service")
+    shutil.copy(
+        os.path.join(GUEST, "kestrel-boot-collect"),
+        os.path.join(root, "usr/local/sbin/"),
+    )
+    shutil.copy(
+        os.path.join(GUEST, "kestrel-boot-collect.service"),
+        os.path.join(root, "etc/systemd/system/"),
+    )
+    run("systemctl", "--root=" + root, "enable", "kestrel-boot-collect.service")
 
 
 def prepare(base, root, deb):

@@ -5,6 +5,8 @@ returns the list of what is wrong."""
 import json
 import os
 
+from .. import tree as trees
+
 STARTING = "7d4958e842da4a758f6c1cdc7b36dcc5"  # systemd's "Starting ..." job
 # Ordinary services of the test system that read the local time.
 READERS = ["cron.service", "systemd-timesyncd.service"]
@@ -36,8 +38,10 @@ class results:
     def __init__(self, directory):
         self.directory = directory
         self.kestrel = read_show(os.path.join(directory, "kestrel.show"))[0]
-        self.units = {unit["Id"]: unit for unit in
-                      read_show(os.path.join(directory, "units.show"))}
+        self.units = {
+            unit["Id"]: unit
+            for unit in read_show(os.path.join(directory, "units.show"))
+        }
         self.journal = read_journal(os.path.join(directory, "journal.json"))
         self.date = self.lines("date")
         self.zdump = self.lines("zdump")
@@ -47,32 +51,49 @@ class results:
             return text.read().splitlines()
 
     def warnings(self):
-        return [entry["MESSAGE"] for entry in self.journal
-                if entry.get("_SYSTEMD_UNIT") == "kestrel.service"]
+        return [
+            entry["MESSAGE"]
+            for entry in self.journal
+            if entry.get("_SYSTEMD_UNIT") == "kestrel.service"
+        ]
 
     def microseconds(self, key, unit=None):
         return int((self.units[unit] if unit else self.kestrel).get(key) or 0)
 
     def duration_ms(self):
-        return (self.microseconds("ExecMainExitTimestampMonotonic") -
-                self.microseconds("ExecMainStartTimestampMonotonic")) / 1000
+        return (
+            self.microseconds("ExecMainExitTimestampMonotonic")
+            - self.microseconds("ExecMainStartTimestampMonotonic")
+        ) / 1000
 
 
 def unit_ran_once(got):
     wrong = []
-    want = {"Result": "success", "ExecMainStatus": "0", "ExecMainCode": "1",
-            "ActiveState": "active", "NRestarts": "0"}
+    want = {
+        "Result": "success",
+        "ExecMainStatus": "0",
+        "ExecMainCode": "1",
+        "ActiveState": "active",
+        "NRestarts": "0",
+    }
     for key, value in want.items():
         if got.kestrel.get(key) != value:
-            wrong.append(f"kestrel.service {key}={got.kestrel.get(key)}, "
-                         f"expected {value}")
-    starts = [entry for entry in got.journal
-              if entry.get("UNIT") == "kestrel.service"
-              and entry.get("MESSAGE_ID") == STARTING]
+            wrong.append(
+                f"kestrel.service {key}={got.kestrel.get(key)}, " f"expected {value}"
+            )
+    starts = [
+        entry
+        for entry in got.journal
+        if entry.get("UNIT") == "kestrel.service"
+        and entry.get("MESSAGE_ID") == STARTING
+    ]
     if len(starts) != 1:
         wrong.append(f"the journal holds {len(starts)} starts of kestrel")
-    pids = {entry.get("_PID") for entry in got.journal
-            if entry.get("_SYSTEMD_UNIT") == "kestrel.service"}
+    pids = {
+        entry.get("_PID")
+        for entry in got.journal
+        if entry.get("_SYSTEMD_UNIT") == "kestrel.service"
+    }
     if len(pids) > 1:
         wrong.append(f"kestrel wrote from {len(pids)} processes")
     return wrong
@@ -82,8 +103,10 @@ def warnings_match(got, sandbox_lines, expected):
     wrong = []
     lines = got.warnings()
     if lines != sandbox_lines:
-        wrong.append(f"journal lines {lines} differ from the device "
-                     f"sandbox's {sandbox_lines}")
+        wrong.append(
+            f"journal lines {lines} differ from the device "
+            f"sandbox's {sandbox_lines}"
+        )
     if expected is not None:
         prefixes = [line.rsplit(": ", 1)[0] for line in lines]
         if prefixes != ["kestrel: " + text for text in expected]:
@@ -108,27 +131,36 @@ def finished_first(got):
 
 def tree_matches(tree, sandbox_tree, expected):
     wrong = []
+
+    def show(path, entry):
+        return "absent" if entry is None else trees.describe(path, entry)
+
     for path in sorted(set(tree) | set(sandbox_tree)):
         if tree.get(path) != sandbox_tree.get(path):
-            wrong.append(f"{path}: booted {tree.get(path)}, "
-                         f"sandbox {sandbox_tree.get(path)}")
+            wrong.append(
+                f"booted {show(path, tree.get(path))}, "
+                f"sandbox {show(path, sandbox_tree.get(path))}"
+            )
     for path, target in expected["links"].items():
         if tree.get(path) != ("link", target):
-            wrong.append(f"{path}: {tree.get(path)}, expected link to {target}")
+            wrong.append(f"{show(path, tree.get(path))}, expected link to {target}")
     for path, content in expected["files"].items():
-        if (tree.get(path) or ("",))[:2] != ("file", repr(content)):
-            wrong.append(f"{path}: {tree.get(path)}, expected {content!r}")
+        entry = tree.get(path)
+        if entry is None or entry[0] != "file" or entry[2] != content:
+            wrong.append(f"{show(path, entry)}, expected {content!r}")
     for path in expected["absent"]:
         if path in tree:
-            wrong.append(f"{path}: {tree[path]}, expected absent")
+            wrong.append(f"{show(path, tree[path])}, expected absent")
     return wrong
 
 
 def local_time_matches(got, sandbox_dates, sandbox_zdump, expected):
     wrong = []
     if got.date != expected["date"] or sandbox_dates != expected["date"]:
-        wrong.append(f"date reports {got.date} (sandbox {sandbox_dates}), "
-                     f"expected {expected['date']}")
+        wrong.append(
+            f"date reports {got.date} (sandbox {sandbox_dates}), "
+            f"expected {expected['date']}"
+        )
     if got.zdump != sandbox_zdump:
         wrong.append(f"zdump reports {got.zdump}, sandbox {sandbox_zdump}")
     return wrong

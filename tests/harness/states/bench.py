@@ -1,5 +1,5 @@
 """The device states the benchmark measures, built fresh in a scratch
-directory from the sample device (sample/make-device).
+directory from the sample device (harness.device.sample).
 
 Each state is a device root plus what puts it back after a kestrel run: a
 copy of every entry of var/db that kestrel may change (all but the staged
@@ -13,13 +13,25 @@ import os
 import shutil
 import subprocess
 
-ROOT = os.path.dirname(os.path.dirname(os.path.abspath(__file__)))
-MAKE_DEVICE = os.path.join(ROOT, "sample", "make-device")
-SCHEMA = "72l"
-# Every entry of var/db that kestrel writes, replaces or removes.
-CHANGEABLE = ("timezone/zoneinfo", "timezone/icutz", "timezone/localtime",
-              "timezone/tz_latest", "timezone/TZVersionDiffRecord",
-              "timezone/needs_cleanup", "icutz", "icu")
+from .. import device, layout
+
+# Every entry of var/db that kestrel writes, replaces or removes, below
+# var/db.
+CHANGEABLE = tuple(
+    path[len("/var/db/") :]
+    for path in (
+        layout.ZONEINFO_LINK,
+        layout.ICUTZ_LINK,
+        layout.LOCALTIME_LINK,
+        layout.LATEST_LINK,
+        layout.VERSION_RECORD,
+        layout.NEEDS_CLEANUP,
+        layout.LEGACY_ICUTZ_LINK,
+        layout.LEGACY_ICU,
+    )
+)
+# The ICU data file of a schema that is not the system's.
+OTHER_SCHEMA_FILE = layout.icu_data_file("71l")
 
 # The many-entries state: files in subdirectories of the ICU directory, and
 # one chain of nested directories, all coming before the data file in the
@@ -35,7 +47,7 @@ class State:
         self.description = description
         self.release = release
         self.update = f"{release}.1.1"
-        self.staged = f"/var/db/timezone/tz/{self.update}"
+        self.staged = layout.STAGED_DIR + self.update
 
     def build(self, scratch, template):
         self.directory = os.path.join(scratch, self.name)
@@ -46,28 +58,21 @@ class State:
         # staged data sets, and the links it rewrites are replaced, not
         # written through.
         subprocess.run(["cp", "-al", template, self.device], check=True)
-        self.relink("icutz", None)
-        self.relink("timezone/localtime",
-                    "/var/db/timezone/zoneinfo/Europe/Paris")
+        os.unlink(os.path.join(self.device, layout.rel(layout.LEGACY_ICUTZ_LINK)))
+        device.link(
+            self.device,
+            layout.LOCALTIME_LINK,
+            layout.zone_link_target(layout.SAMPLE_ZONE),
+        )
         self.shape()
         self.save()
 
-    def relink(self, entry, target):
-        path = os.path.join(self.var_db, entry)
-        if os.path.lexists(path):
-            os.unlink(path)
-        if target is not None:
-            os.symlink(target, path)
-
-    def write(self, entry, text):
-        with open(os.path.join(self.var_db, entry), "w") as out:
-            out.write(text)
-
     def make_update_current(self):
-        self.relink("timezone/zoneinfo", self.staged + "/zoneinfo")
-        self.relink("timezone/icutz", self.staged + "/icutz")
-        self.write("timezone/TZVersionDiffRecord",
-                   f"{self.release}.1.0_{self.update}")
+        device.link(self.device, layout.ZONEINFO_LINK, self.staged + "/zoneinfo")
+        device.link(self.device, layout.ICUTZ_LINK, self.staged + "/icutz")
+        device.write(
+            self.device, layout.VERSION_RECORD, f"{self.release}.1.0_{self.update}"
+        )
 
     def save(self):
         self.pristine = os.path.join(self.directory, "pristine")
@@ -75,16 +80,18 @@ class State:
         for entry in CHANGEABLE:
             source = os.path.join(self.var_db, entry)
             if os.path.lexists(source):
-                subprocess.run(["cp", "-a", source,
-                                os.path.join(self.pristine, entry)],
-                               check=True)
+                subprocess.run(
+                    ["cp", "-a", source, os.path.join(self.pristine, entry)], check=True
+                )
         self.restore = os.path.join(self.directory, "restore")
         removals = " ".join(f"'{self.var_db}/{entry}'" for entry in CHANGEABLE)
         with open(self.restore, "w") as script:
-            script.write("#!/bin/sh\n# Puts back what kestrel may have "
-                         "changed on this benchmark device.\nset -e\n"
-                         f"rm -rf {removals}\n"
-                         f"exec cp -a '{self.pristine}/.' '{self.var_db}/'\n")
+            script.write(
+                "#!/bin/sh\n# Puts back what kestrel may have "
+                "changed on this benchmark device.\nset -e\n"
+                f"rm -rf {removals}\n"
+                f"exec cp -a '{self.pristine}/.' '{self.var_db}/'\n"
+            )
         os.chmod(self.restore, 0o755)
 
     def outcome_matches(self, before, after, stderr):
@@ -100,7 +107,9 @@ class CommonStart(State):
     def outcome_matches(self, before, after, stderr):
         return after == before and any(
             "New update not compatible or older version: "
-            f"{self.update} vs. {self.update}" in line for line in stderr)
+            f"{self.update} vs. {self.update}" in line
+            for line in stderr
+        )
 
 
 class FirstAdoption(State):
@@ -110,10 +119,13 @@ class FirstAdoption(State):
         pass
 
     def outcome_matches(self, before, after, stderr):
-        return (after.get("timezone/zoneinfo") ==
-                ["link", self.staged + "/zoneinfo"] and
-                after.get("timezone/TZVersionDiffRecord") ==
-                ["file", f"{self.release}.1.0_{self.update}"])
+        return after.get("timezone/zoneinfo") == [
+            "link",
+            self.staged + "/zoneinfo",
+        ] and after.get("timezone/TZVersionDiffRecord") == [
+            "file",
+            f"{self.release}.1.0_{self.update}",
+        ]
 
 
 class IncompatibleReset(State):
@@ -121,16 +133,21 @@ class IncompatibleReset(State):
 
     def shape(self):
         icu = os.path.join(self.device, self.staged[1:], "icutz")
-        os.rename(os.path.join(icu, f"icutz{SCHEMA}.dat"),
-                  os.path.join(icu, "icutz71l.dat"))
+        os.rename(
+            os.path.join(icu, layout.icu_data_file()),
+            os.path.join(icu, OTHER_SCHEMA_FILE),
+        )
         self.make_update_current()
 
     def outcome_matches(self, before, after, stderr):
-        return (after.get("timezone/zoneinfo") ==
-                ["link", "/usr/share/zoneinfo.default"] and
-                "timezone/needs_cleanup" in after and any(
-                    "Symlink points at data incompatible with installed "
-                    "system" in line for line in stderr))
+        return (
+            after.get("timezone/zoneinfo") == ["link", layout.SYSTEM_ZONEINFO]
+            and "timezone/needs_cleanup" in after
+            and any(
+                "Symlink points at data incompatible with installed " "system" in line
+                for line in stderr
+            )
+        )
 
 
 class ManyEntries(CommonStart):
@@ -139,7 +156,7 @@ class ManyEntries(CommonStart):
 
     def shape(self):
         icu = os.path.join(self.device, self.staged[1:], "icutz")
-        data_file = f"icutz{SCHEMA}.dat"
+        data_file = layout.icu_data_file()
         kept = self.directories_ahead_of(icu, data_file)
         for name in kept[:SUBDIRECTORIES]:
             self.fill(os.path.join(icu, name))
@@ -158,12 +175,13 @@ class ManyEntries(CommonStart):
         for name in candidates:
             os.mkdir(os.path.join(icu, name))
         order = os.listdir(icu)
-        ahead = order[:order.index(data_file)]
+        ahead = order[: order.index(data_file)]
         kept = [name for name in ahead if name in candidates]
         if len(kept) < SUBDIRECTORIES + 1:
-            raise RuntimeError(f"only {len(kept)} directories come before "
-                               f"{data_file} in {icu}")
-        for name in set(candidates) - set(kept[:SUBDIRECTORIES + 1]):
+            raise RuntimeError(
+                f"only {len(kept)} directories come before " f"{data_file} in {icu}"
+            )
+        for name in set(candidates) - set(kept[: SUBDIRECTORIES + 1]):
             os.rmdir(os.path.join(icu, name))
         return kept
 
@@ -171,14 +189,19 @@ class ManyEntries(CommonStart):
     def write_decoy(directory):
         # A data file of another schema below the ICU directory: it never
         # qualifies, wherever the walk meets it.
-        with open(os.path.join(directory, "icutz71l.dat"), "w") as out:
+        with open(os.path.join(directory, OTHER_SCHEMA_FILE), "w") as out:
             out.write("not data at this depth\n")
 
     def fill(self, directory):
         self.write_decoy(directory)
         for number in range(FILES_PER_SUBDIRECTORY - 1):
-            os.close(os.open(os.path.join(directory, f"f{number:05d}"),
-                             os.O_CREAT | os.O_WRONLY, 0o644))
+            os.close(
+                os.open(
+                    os.path.join(directory, f"f{number:05d}"),
+                    os.O_CREAT | os.O_WRONLY,
+                    0o644,
+                )
+            )
 
 
 STATES = (
@@ -189,18 +212,12 @@ STATES = (
 )
 
 
-def release_of_sample():
-    with open("/usr/share/zoneinfo/tzdata.zi") as data:
-        return data.readline().split()[-1]
-
-
 def build_states(scratch):
     """Builds every state under scratch (made anew) and returns them."""
     shutil.rmtree(scratch, ignore_errors=True)
     os.makedirs(scratch)
     template = os.path.join(scratch, "template")
-    subprocess.run([MAKE_DEVICE, template], check=True)
-    release = release_of_sample()
+    release = device.sample(template)
     states = []
     for name, kind in STATES:
         state = kind(name, " ".join(kind.__doc__.split()), release)

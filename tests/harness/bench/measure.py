@@ -1,7 +1,6 @@
-#!/usr/bin/env python3
 """Measures kestrel and the do-nothing program on one device state.
 
-    tools/device-sandbox --reader DEVICE python3 bench/measure.py CONFIG.json
+    tools/device-sandbox --reader DEVICE python3 -m harness.bench.measure CONFIG.json
 
 Runs inside the device sandbox's reader namespace, where the device's var/db
 and usr/share are mounted over /var/db and /usr/share, so that kestrel, built
@@ -19,8 +18,7 @@ import sys
 import tempfile
 import time
 
-sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
-import devices  # noqa: E402
+from ..states import bench as devices
 
 
 def restore(config):
@@ -33,14 +31,22 @@ def outcome(config):
     restore(config)
     before = devices.snapshot(config["var_db"])
     start = time.perf_counter()
-    run = subprocess.run([config["kestrel"]], stdin=subprocess.DEVNULL,
-                         stderr=subprocess.PIPE, check=False)
+    run = subprocess.run(
+        [config["kestrel"]],
+        stdin=subprocess.DEVNULL,
+        stderr=subprocess.PIPE,
+        check=False,
+    )
     seconds = time.perf_counter() - start
     after = devices.snapshot(config["var_db"])
     restore(config)
-    return {"before": before, "after": after, "exit": run.returncode,
-            "stderr": run.stderr.decode("latin-1").splitlines(),
-            "rough_seconds": seconds}
+    return {
+        "before": before,
+        "after": after,
+        "exit": run.returncode,
+        "stderr": run.stderr.decode("latin-1").splitlines(),
+        "rough_seconds": seconds,
+    }
 
 
 def rounds_and_runs(config, rough_seconds):
@@ -66,14 +72,28 @@ def wall_times(config, scratch, rounds, runs, warmup):
         if round_number % 2:
             names.reverse()
         export = os.path.join(scratch, f"round{round_number}.json")
-        command = ["hyperfine", "-N", "--style", "none", "--warmup", str(warmup),
-                   "--runs", str(runs), "--export-json", export,
-                   "--prepare", config["restore"]]
+        command = [
+            "hyperfine",
+            "-N",
+            "--style",
+            "none",
+            "--warmup",
+            str(warmup),
+            "--runs",
+            str(runs),
+            "--export-json",
+            export,
+            "--prepare",
+            config["restore"],
+        ]
         # Its advice about outliers would only repeat that the machine is
         # shared; its errors are shown.
-        done = subprocess.run(command + [config[name] for name in names],
-                              stdout=subprocess.DEVNULL,
-                              stderr=subprocess.PIPE, check=False)
+        done = subprocess.run(
+            command + [config[name] for name in names],
+            stdout=subprocess.DEVNULL,
+            stderr=subprocess.PIPE,
+            check=False,
+        )
         if done.returncode != 0:
             sys.exit(done.stderr.decode("latin-1"))
         with open(export) as data:
@@ -92,12 +112,21 @@ def instructions(binary, config, repeats):
     for _ in range(repeats):
         restore(config)
         run = subprocess.run(
-            ["valgrind", "--tool=callgrind", "--callgrind-out-file=/dev/null",
-             binary], stdin=subprocess.DEVNULL, stderr=subprocess.PIPE,
-            check=True)
+            ["valgrind", "--tool=callgrind", "--callgrind-out-file=/dev/null", binary],
+            stdin=subprocess.DEVNULL,
+            stderr=subprocess.PIPE,
+            check=True,
+        )
         found = re.search(r"Collected : (\d+)", run.stderr.decode("latin-1"))
         counts.append(int(found.group(1)))
     return counts
+
+
+def run_quietly(command):
+    """A measuring command, its output in its own report file."""
+    subprocess.run(
+        command, stdin=subprocess.DEVNULL, stderr=subprocess.DEVNULL, check=True
+    )
 
 
 def memory(binary, config, repeats, scratch):
@@ -107,9 +136,7 @@ def memory(binary, config, repeats, scratch):
     figures = {"peak_rss_kib": [], "minor_faults": []}
     for _ in range(repeats):
         restore(config)
-        subprocess.run(["/usr/bin/time", "-f", "%M %R", "-o", report, binary],
-                       stdin=subprocess.DEVNULL, stderr=subprocess.DEVNULL,
-                       check=True)
+        run_quietly(["/usr/bin/time", "-f", "%M %R", "-o", report, binary])
         with open(report) as data:
             peak, faults = data.read().split()[-2:]
         figures["peak_rss_kib"].append(int(peak))
@@ -121,9 +148,7 @@ def system_calls(binary, config, scratch):
     """strace -c's table of the program's own calls, from its execve on."""
     report = os.path.join(scratch, "strace")
     restore(config)
-    subprocess.run(["strace", "-f", "-c", "-o", report, binary],
-                   stdin=subprocess.DEVNULL, stderr=subprocess.DEVNULL,
-                   check=True)
+    run_quietly(["strace", "-f", "-c", "-o", report, binary])
     by_name, total, errors = {}, 0, 0
     with open(report) as data:
         for line in data:
@@ -140,31 +165,44 @@ def system_calls(binary, config, scratch):
 
 
 def main():
+    # The measured programs get the environment the benchmark was started
+    # with: every variable costs kestrel's start instructions.
+    for name in ("PYTHONPATH", "PYTHONDONTWRITEBYTECODE"):
+        os.environ.pop(name, None)
     with open(sys.argv[1]) as data:
         config = json.load(data)
     with tempfile.TemporaryDirectory(prefix="kestrel-measure.") as scratch:
         result = {"outcome": outcome(config)}
         rough = result["outcome"]["rough_seconds"]
         rounds, runs = rounds_and_runs(config, rough)
-        times, round_ratios = wall_times(config, scratch, rounds, runs,
-                                         2 if rough < 0.02 else 1)
+        times, round_ratios = wall_times(
+            config, scratch, rounds, runs, 2 if rough < 0.02 else 1
+        )
         result["wall_seconds"] = {
-            name: {"median": statistics.median(values), "runs": len(values),
-                   "min": min(values), "max": max(values)}
-            for name, values in times.items()}
+            name: {
+                "median": statistics.median(values),
+                "runs": len(values),
+                "min": min(values),
+                "max": max(values),
+            }
+            for name, values in times.items()
+        }
         result["wall_round_ratios"] = round_ratios
         result["wall_plan"] = {"rounds": rounds, "runs_per_round": runs}
         result["instructions"] = {
             "kestrel": instructions(config["kestrel"], config, 3),
-            "do_nothing": instructions(config["do_nothing"], config, 1)}
-        memories = {name: memory(config[name], config, 3, scratch)
-                    for name in ("kestrel", "do_nothing")}
+            "do_nothing": instructions(config["do_nothing"], config, 1),
+        }
+        memories = {
+            name: memory(config[name], config, 3, scratch)
+            for name in ("kestrel", "do_nothing")
+        }
         for figure in ("peak_rss_kib", "minor_faults"):
-            result[figure] = {name: memories[name][figure]
-                              for name in memories}
+            result[figure] = {name: memories[name][figure] for name in memories}
         result["system_calls"] = {
             name: system_calls(config[name], config, scratch)
-            for name in ("kestrel", "do_nothing")}
+            for name in ("kestrel", "do_nothing")
+        }
         restore(config)
     with open(config["output"], "w") as out:
         json.dump(result, out, indent=1)
