@@ -26,9 +26,18 @@ import time
 
 ROOT = os.path.dirname(os.path.dirname(os.path.abspath(__file__)))
 RELEASES = os.path.join(ROOT, "tests", "data", "tz-releases")
-DATA_FILES = ["africa", "antarctica", "asia", "australasia", "europe",
-              "northamerica", "southamerica", "etcetera", "factory",
-              "backward"]
+DATA_FILES = [
+    "africa",
+    "antarctica",
+    "asia",
+    "australasia",
+    "europe",
+    "northamerica",
+    "southamerica",
+    "etcetera",
+    "factory",
+    "backward",
+]
 TARGET = 5.0
 
 STAGE_ON_EMPTY_DEVICE = r"""
@@ -60,15 +69,35 @@ def one_round(build, release, scratch):
     os.makedirs(source)
     tarball = os.path.join(RELEASES, f"tzdata{release}.tar.gz")
     subprocess.run(["tar", "-xzf", tarball, "-C", source], check=True)
-    zic = timed(["zic", "-d", os.path.join(scratch, "zic-out")] + DATA_FILES,
-                cwd=source)
+    zic = timed(
+        ["zic", "-d", os.path.join(scratch, "zic-out")] + DATA_FILES, cwd=source
+    )
     data = os.path.join(build, "kestrel-data")
     out = os.path.join(scratch, "set")
-    build_time = timed([data, "build", "--icu",
-                        os.path.join(RELEASES, "icu", release, "le"),
-                        tarball, out], stdout=subprocess.DEVNULL)
-    stage_time = timed(["unshare", "--user", "--map-root-user", "--mount",
-                        "sh", "-c", STAGE_ON_EMPTY_DEVICE, data, out])
+    build_time = timed(
+        [
+            data,
+            "build",
+            "--icu",
+            os.path.join(RELEASES, "icu", release, "le"),
+            tarball,
+            out,
+        ],
+        stdout=subprocess.DEVNULL,
+    )
+    stage_time = timed(
+        [
+            "unshare",
+            "--user",
+            "--map-root-user",
+            "--mount",
+            "sh",
+            "-c",
+            STAGE_ON_EMPTY_DEVICE,
+            data,
+            out,
+        ]
+    )
     return zic, build_time, stage_time
 
 
@@ -82,20 +111,24 @@ def main():
     for _ in range(args.rounds):
         scratch = tempfile.mkdtemp(prefix="kestrel-data-bench.")
         try:
-            rounds.append(one_round(os.path.abspath(args.build), args.release,
-                                    scratch))
+            rounds.append(one_round(os.path.abspath(args.build), args.release, scratch))
         finally:
             shutil.rmtree(scratch)
-    print(f"release {args.release}, median of {args.rounds} rounds,"
-          " wall time and processor time")
+    print(
+        f"release {args.release}, median of {args.rounds} rounds,"
+        " wall time and processor time"
+    )
     for kind, index in (("wall", 0), ("processor", 1)):
-        zic, build, stage = (statistics.median(r[i][index] for r in rounds)
-                             for i in range(3))
+        zic, build, stage = (
+            statistics.median(r[i][index] for r in rounds) for i in range(3)
+        )
         ratio = (build + stage) / zic
-        print(f"  {kind}: zic alone {zic:.3f} s, kestrel-data build {build:.3f} s"
-              f" + stage {stage:.3f} s (each with verification):"
-              f" {ratio:.2f} x zic (target at most {TARGET:g}:"
-              f" {'met' if ratio <= TARGET else 'not met'})")
+        print(
+            f"  {kind}: zic alone {zic:.3f} s, kestrel-data build {build:.3f} s"
+            f" + stage {stage:.3f} s (each with verification):"
+            f" {ratio:.2f} x zic (target at most {TARGET:g}:"
+            f" {'met' if ratio <= TARGET else 'not met'})"
+        )
 
 
 if __name__ == "__main__":
