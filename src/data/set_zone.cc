@@ -1,0 +1,153 @@
+#include "data/set_zone.h"
+
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <cstring>
+#include <string_view>
+
+#include "fs/paths.h"
+
+namespace data {
+
+namespace {
+
+constexpr char kEtcLocaltime[] = "/etc/localtime";
+constexpr char kLock[] = "/var/db/timezone/.kestrel-data.lock";
+// The new link is made here, then renamed over the device's link.
+constexpr char kNewLocaltime[] = "/var/db/timezone/.localtime.new";
+constexpr std::string_view kNameBytes =
+    "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ0123456789/_+-.";
+
+// A name that stays inside the zone directory: no empty, "." or ".."
+// component, only the bytes tz's own names use.
+bool valid_name(std::string_view zone) {
+  if (zone.empty() || zone.find_first_not_of(kNameBytes) != zone.npos) {
+    return false;
+  }
+  std::size_t start = 0;
+  while (start <= zone.size()) {
+    const std::size_t end = std::min(zone.find('/', start), zone.size());
+    const std::string_view part = zone.substr(start, end - start);
+    if (part.empty() || part == "." || part == "..") {
+      return false;
+    }
+    start = end + 1;
+  }
+  return true;
+}
+
+// Whether path leads to a compiled zone: a regular file that begins with the
+// magic of tzfile(5).
+bool is_zone_file(const std::string& path) {
+  const int fd = open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK);
+  if (fd < 0) {
+    return false;
+  }
+  struct stat status {};
+  std::array<char, 4> magic{};
+  const bool zone = fstat(fd, &status) == 0 && S_ISREG(status.st_mode) &&
+                    read(fd, magic.data(), magic.size()) == 4 &&
+                    std::string_view(magic.data(), magic.size()) == "TZif";
+  close(fd);
+  return zone;
+}
+
+// Holds kestrel-data's lock for as long as it lives; fd is -1 when it could
+// not be taken, with errno saying why.
+class command_lock {
+ public:
+  command_lock()
+      : fd(open(kLock, O_RDWR | O_CREAT | O_CLOEXEC | O_NOFOLLOW, 0644)) {
+    if (fd >= 0 && flock(fd, LOCK_EX | LOCK_NB) != 0) {
+      const int error = errno;
+      close(fd);
+      fd = -1;
+      errno = error;
+    }
+  }
+  ~command_lock() {
+    if (fd >= 0) {
+      close(fd);
+    }
+  }
+  command_lock(const command_lock&) = delete;
+  command_lock& operator=(const command_lock&) = delete;
+  bool held() const { return fd >= 0; }
+
+ private:
+  int fd;
+};
+
+// Makes the link at kNewLocaltime and renames it over the device's link.
+// Under the lock, an entry already at kNewLocaltime is a leftover of an
+// interrupted run.
+bool replace_localtime(const std::string& target) {
+  unlink(kNewLocaltime);
+  if (symlink(target.c_str(), kNewLocaltime) != 0) {
+    return false;
+  }
+  if (rename(kNewLocaltime, paths::kLocaltimeLink) != 0) {
+    const int error = errno;
+    unlink(kNewLocaltime);
+    errno = error;
+    return false;
+  }
+  // The rename is in the directory: make it durable before saying it is done.
+  const int dir = open(paths::kTimezoneDir, O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  if (dir >= 0) {
+    fsync(dir);
+    close(dir);
+  }
+  return true;
+}
+
+}  // namespace
+
+int set_zone(const std::string& zone, std::ostream& out, std::ostream& err) {
+  const std::string me = "kestrel-data set-zone: ";
+  if (!valid_name(zone)) {
+    err << me << "\"" << zone << "\" is not a zone name\n";
+    return 1;
+  }
+  const command_lock lock;
+  if (!lock.held()) {
+    err << me
+        << (errno == EWOULDBLOCK
+                ? "another kestrel-data command is changing the device; try "
+                  "again when it is done"
+                : "cannot take the lock " + std::string(kLock) + ": " +
+                      std::strerror(errno))
+        << "\n";
+    return 1;
+  }
+  const std::string target = std::string(paths::kZoneinfoLink) + "/" + zone;
+  if (!is_zone_file(target)) {
+    err << me << "no zone " << zone << " in the current data ("
+        << paths::kZoneinfoLink << ")\n";
+    return 1;
+  }
+  if (!replace_localtime(target)) {
+    err << me << "cannot point " << paths::kLocaltimeLink << " at " << target
+        << ": " << std::strerror(errno) << "\n";
+    return 1;
+  }
+  out << "The device's zone is " << zone << ".\n";
+  char etc_target[sizeof(paths::kLocaltimeLink) + 1] = {};
+  const ssize_t length =
+      readlink(kEtcLocaltime, etc_target, sizeof(etc_target) - 1);
+  if (length < 0 || std::string_view(etc_target, length) !=
+                        std::string_view(paths::kLocaltimeLink)) {
+    err << me << kEtcLocaltime << " does not lead to " << paths::kLocaltimeLink
+        << ": programs do not see this zone until it does (dpkg-reconfigure "
+           "kestrel points it back)\n";
+  }
+  return 0;
+}
+
+}  // namespace data
