@@ -19,8 +19,9 @@ namespace {
 
 constexpr char kEtcLocaltime[] = "/etc/localtime";
 constexpr char kLock[] = "/var/db/timezone/.kestrel-data.lock";
-// The new link is made here, then renamed over the device's link.
+// New links are made beside the old ones, then renamed over them.
 constexpr char kNewLocaltime[] = "/var/db/timezone/.localtime.new";
+constexpr char kNewEtcLocaltime[] = "/etc/.localtime.kestrel-new";
 constexpr std::string_view kNameBytes =
     "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ0123456789/_+-.";
 
@@ -84,27 +85,37 @@ class command_lock {
   int fd;
 };
 
-// Makes the link at kNewLocaltime and renames it over the device's link.
-// Under the lock, an entry already at kNewLocaltime is a leftover of an
+// Makes the link at scratch and renames it over link, then makes the rename
+// durable. Under the lock, an entry already at scratch is a leftover of an
 // interrupted run.
-bool replace_localtime(const std::string& target) {
-  unlink(kNewLocaltime);
-  if (symlink(target.c_str(), kNewLocaltime) != 0) {
+bool replace_link(const std::string& target, const char* link,
+                  const char* scratch) {
+  unlink(scratch);
+  if (symlink(target.c_str(), scratch) != 0) {
     return false;
   }
-  if (rename(kNewLocaltime, paths::kLocaltimeLink) != 0) {
+  if (rename(scratch, link) != 0) {
     const int error = errno;
-    unlink(kNewLocaltime);
+    unlink(scratch);
     errno = error;
     return false;
   }
-  // The rename is in the directory: make it durable before saying it is done.
-  const int dir = open(paths::kTimezoneDir, O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  const std::string dir_path(link, std::strrchr(link, '/'));
+  const int dir = open(dir_path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
   if (dir >= 0) {
     fsync(dir);
     close(dir);
   }
   return true;
+}
+
+// Whether /etc/localtime leads to the device's link, as the package lays it
+// out; timedatectl and tzdata's postinst point it into /usr/share/zoneinfo.
+bool etc_localtime_is_the_devices() {
+  char target[sizeof(paths::kLocaltimeLink) + 1] = {};
+  const ssize_t length = readlink(kEtcLocaltime, target, sizeof(target) - 1);
+  return length >= 0 && std::string_view(target, length) ==
+                            std::string_view(paths::kLocaltimeLink);
 }
 
 }  // namespace
@@ -132,21 +143,23 @@ int set_zone(const std::string& zone, std::ostream& out, std::ostream& err) {
         << paths::kZoneinfoLink << ")\n";
     return 1;
   }
-  if (!replace_localtime(target)) {
+  if (!replace_link(target, paths::kLocaltimeLink, kNewLocaltime)) {
     err << me << "cannot point " << paths::kLocaltimeLink << " at " << target
         << ": " << std::strerror(errno) << "\n";
     return 1;
   }
   out << "The device's zone is " << zone << ".\n";
-  char etc_target[sizeof(paths::kLocaltimeLink) + 1] = {};
-  const ssize_t length =
-      readlink(kEtcLocaltime, etc_target, sizeof(etc_target) - 1);
-  if (length < 0 || std::string_view(etc_target, length) !=
-                        std::string_view(paths::kLocaltimeLink)) {
-    err << me << kEtcLocaltime << " does not lead to " << paths::kLocaltimeLink
-        << ": programs do not see this zone until it does (dpkg-reconfigure "
-           "kestrel points it back)\n";
+  if (etc_localtime_is_the_devices()) {
+    return 0;
   }
+  if (!replace_link(paths::kLocaltimeLink, kEtcLocaltime, kNewEtcLocaltime)) {
+    err << me << "cannot point " << kEtcLocaltime << " at "
+        << paths::kLocaltimeLink << ": " << std::strerror(errno)
+        << "; programs do not see the device's zone until it leads there\n";
+    return 1;
+  }
+  out << kEtcLocaltime << " led elsewhere; it leads to "
+      << paths::kLocaltimeLink << " again.\n";
   return 0;
 }
 

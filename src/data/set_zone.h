@@ -14,11 +14,12 @@ namespace data {
 // component) whose file in the data the zoneinfo link designates is a
 // compiled zone. The link is made beside the old one and renamed over it:
 // readers find the old zone or the new one, never none. It holds the lock
-// of kestrel-data's commands. Afterwards it says whether /etc/localtime
-// still leads to the device's zone (another program may have rewritten it).
+// of kestrel-data's commands. Then, if another program (timedatectl,
+// tzdata's postinst) pointed /etc/localtime elsewhere, it points it back at
+// /var/db/timezone/localtime the same way.
 //
-// Returns the exit status: 0 when the zone is set, 1 when refused (a line
-// on err, nothing changed).
+// Returns the exit status: 0 when the zone is set and /etc/localtime leads
+// to it, 1 otherwise (a line on err; a refusal changes nothing).
 int set_zone(const std::string& zone, std::ostream& out, std::ostream& err);
 
 }  // namespace data

@@ -79,19 +79,49 @@ TEST_F(set_zone_test, replaces_a_localtime_that_is_not_a_link) {
             "/var/db/timezone/zoneinfo/Europe/Paris");
 }
 
+// The states another program leaves /etc/localtime in: timedatectl's
+// relative link, tzdata's absolute one, a copied file, nothing.
+TEST_F(set_zone_test, points_etc_localtime_back_when_it_leads_elsewhere) {
+  const std::vector<std::function<void()>> states = {
+      [] {
+        tree::make_link("../usr/share/zoneinfo/Asia/Tokyo", "/etc/localtime");
+      },
+      [] {
+        tree::make_link("/usr/share/zoneinfo/Asia/Tokyo", "/etc/localtime");
+      },
+      [] { tree::write_file("/etc/localtime", "TZif2 copied"); },
+      [] {},
+  };
+  for (std::size_t i = 0; i < states.size(); ++i) {
+    SCOPED_TRACE(i);
+    unlink("/etc/localtime");
+    states[i]();
+    out.str("");
+    EXPECT_EQ(run("Europe/Paris"), 0);
+    EXPECT_EQ(tree::link_target(kLocaltime),
+              "/var/db/timezone/zoneinfo/Europe/Paris");
+    EXPECT_EQ(tree::link_target("/etc/localtime"), kLocaltime);
+    EXPECT_EQ(out.str(),
+              "The device's zone is Europe/Paris.\n"
+              "/etc/localtime led elsewhere; it leads to "
+              "/var/db/timezone/localtime again.\n");
+    EXPECT_FALSE(tree::present("/etc/.localtime.kestrel-new"));
+  }
+  EXPECT_EQ(err.str(), "");
+}
+
 TEST_F(set_zone_test,
-       sets_the_zone_but_says_when_etc_localtime_leads_elsewhere) {
+       sets_the_zone_but_fails_when_etc_localtime_is_a_directory) {
   unlink("/etc/localtime");
-  tree::make_link("../usr/share/zoneinfo/Asia/Tokyo", "/etc/localtime");
-  EXPECT_EQ(run("Europe/Paris"), 0);
+  tree::write_file("/etc/localtime/kept", "");
+  EXPECT_EQ(run("Europe/Paris"), 1);
   EXPECT_EQ(tree::link_target(kLocaltime),
             "/var/db/timezone/zoneinfo/Europe/Paris");
   EXPECT_EQ(err.str(),
-            "kestrel-data set-zone: /etc/localtime does not lead to "
-            "/var/db/timezone/localtime: programs do not see this zone until "
-            "it does (dpkg-reconfigure kestrel points it back)\n");
-  EXPECT_EQ(tree::link_target("/etc/localtime"),
-            "../usr/share/zoneinfo/Asia/Tokyo");
+            "kestrel-data set-zone: cannot point /etc/localtime at "
+            "/var/db/timezone/localtime: Is a directory; programs do not see "
+            "the device's zone until it leads there\n");
+  EXPECT_FALSE(tree::present("/etc/.localtime.kestrel-new"));
 }
 
 struct refusal {
