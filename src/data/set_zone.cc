@@ -1,7 +1,6 @@
 #include "data/set_zone.h"
 
 #include <fcntl.h>
-#include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -9,8 +8,13 @@
 #include <array>
 #include <cerrno>
 #include <cstring>
+#include <iostream>
+#include <optional>
+#include <stdexcept>
 #include <string_view>
 
+#include "data/staging_lock.h"
+#include "data/usage_error.h"
 #include "fs/paths.h"
 
 namespace data {
@@ -18,7 +22,6 @@ namespace data {
 namespace {
 
 constexpr char kEtcLocaltime[] = "/etc/localtime";
-constexpr char kLock[] = "/var/db/timezone/.kestrel-data.lock";
 // New links are made beside the old ones, then renamed over them.
 constexpr char kNewLocaltime[] = "/var/db/timezone/.localtime.new";
 constexpr char kNewEtcLocaltime[] = "/etc/.localtime.kestrel-new";
@@ -58,32 +61,6 @@ bool is_zone_file(const std::string& path) {
   close(fd);
   return zone;
 }
-
-// Holds kestrel-data's lock for as long as it lives; fd is -1 when it could
-// not be taken, with errno saying why.
-class command_lock {
- public:
-  command_lock()
-      : fd(open(kLock, O_RDWR | O_CREAT | O_CLOEXEC | O_NOFOLLOW, 0644)) {
-    if (fd >= 0 && flock(fd, LOCK_EX | LOCK_NB) != 0) {
-      const int error = errno;
-      close(fd);
-      fd = -1;
-      errno = error;
-    }
-  }
-  ~command_lock() {
-    if (fd >= 0) {
-      close(fd);
-    }
-  }
-  command_lock(const command_lock&) = delete;
-  command_lock& operator=(const command_lock&) = delete;
-  bool held() const { return fd >= 0; }
-
- private:
-  int fd;
-};
 
 // Makes the link at scratch and renames it over link, then makes the rename
 // durable. Under the lock, an entry already at scratch is a leftover of an
@@ -126,15 +103,13 @@ int set_zone(const std::string& zone, std::ostream& out, std::ostream& err) {
     err << me << "\"" << zone << "\" is not a zone name\n";
     return 1;
   }
-  const command_lock lock;
-  if (!lock.held()) {
-    err << me
-        << (errno == EWOULDBLOCK
-                ? "another kestrel-data command is changing the device; try "
-                  "again when it is done"
-                : "cannot take the lock " + std::string(kLock) + ": " +
-                      std::strerror(errno))
-        << "\n";
+  std::optional<staging_lock> lock;
+  try {
+    lock.emplace(
+        "another kestrel-data command is changing the device; try again when "
+        "it is done");
+  } catch (const std::runtime_error& busy) {
+    err << me << busy.what() << "\n";
     return 1;
   }
   const std::string target = std::string(paths::kZoneinfoLink) + "/" + zone;
@@ -161,6 +136,13 @@ int set_zone(const std::string& zone, std::ostream& out, std::ostream& err) {
   out << kEtcLocaltime << " led elsewhere; it leads to "
       << paths::kLocaltimeLink << " again.\n";
   return 0;
+}
+
+int run_set_zone(const std::vector<std::string>& args) {
+  if (args.size() != 1) {
+    throw usage_error("set-zone ZONE");
+  }
+  return set_zone(args[0], std::cout, std::cerr);
 }
 
 }  // namespace data

@@ -3,6 +3,7 @@
 
 #include <ostream>
 #include <string>
+#include <vector>
 
 namespace data {
 
@@ -21,6 +22,9 @@ namespace data {
 // Returns the exit status: 0 when the zone is set and /etc/localtime leads
 // to it, 1 otherwise (a line on err; a refusal changes nothing).
 int set_zone(const std::string& zone, std::ostream& out, std::ostream& err);
+
+// The subcommand: its one argument is the zone.
+int run_set_zone(const std::vector<std::string>& args);
 
 }  // namespace data
 

@@ -172,7 +172,7 @@ const std::vector<refusal> refusals = {
      },
      no_zone("Europe/Paris")},
     {"device_not_laid_out", "Europe/Paris", [] { tree::clear("/var/db"); },
-     "kestrel-data set-zone: cannot take the lock "
+     "kestrel-data set-zone: cannot open "
      "/var/db/timezone/.kestrel-data.lock: No such file or directory\n"},
     {"localtime_is_a_directory", "Europe/Paris",
      [] {

@@ -1,0 +1,17 @@
+#ifndef KESTREL_TESTS_UNIT_DATA_DEVICE_TREE_H_
+#define KESTREL_TESTS_UNIT_DATA_DEVICE_TREE_H_
+
+#include <map>
+#include <string>
+
+// Everything under root, path by path: each entry's kind, permission bits
+// and content or link target. Two snapshots are equal exactly when nothing
+// under root changed but times.
+std::map<std::string, std::string> snapshot(const std::string& root);
+
+// The private device of a test: the system partition's release and ICU
+// schema, and the zoneinfo link at the system partition.
+void make_device(const std::string& system_release,
+                 const std::string& system_schema = "44l");
+
+#endif  // KESTREL_TESTS_UNIT_DATA_DEVICE_TREE_H_

@@ -1,0 +1,161 @@
+#include "data/set_archive.h"
+
+#include <functional>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "data/tar_header.h"
+#include "gtest/gtest.h"
+#include "hand_made_archive.h"
+#include "scratch_dir.h"
+#include "tree.h"
+
+namespace {
+
+const std::string kVersion = "2026a\n";
+
+TEST(set_archive_test, a_packed_set_reads_back_the_same) {
+  const scratch_dir dir;
+  tree::write_file(dir / "set/zoneinfo/+VERSION", kVersion);
+  tree::write_file(dir / "set/zoneinfo/Europe/Paris", std::string(1300, 'x'));
+  tree::make_link("../+VERSION", dir / "set/zoneinfo/Europe/V");
+  tree::write_file(dir / "set/icutz/icutz44l.dat", "data", 0644);
+  const set_image image = set_image::from_directory(dir / "set");
+  write_set_archive(image, dir / "a.tgz");
+  const set_image back = read_set_archive(dir / "a.tgz");
+  ASSERT_EQ(back.members().size(), image.members().size());
+  for (std::size_t i = 0; i < image.members().size(); ++i) {
+    EXPECT_EQ(back.members()[i].path, image.members()[i].path);
+    EXPECT_EQ(back.members()[i].type, image.members()[i].type);
+    EXPECT_EQ(back.members()[i].data, image.members()[i].data);
+    EXPECT_EQ(back.members()[i].mode, image.members()[i].mode);
+  }
+  EXPECT_EQ(back.release(), "2026a");
+  EXPECT_EQ(back.schema(), "44l");
+}
+
+TEST(set_archive_test, a_hand_made_good_archive_is_read) {
+  const scratch_dir dir;
+  write_gzip(dir / "a.tgz", tar_bytes(good_members()));
+  EXPECT_EQ(read_set_archive(dir / "a.tgz").members().size(), 3U);
+}
+
+TEST(set_archive_test, bad_archives_are_refused_naming_the_fault) {
+  const std::string good = tar_bytes(good_members());
+  const struct {
+    const char* name;
+    std::function<std::string()> bytes;
+    const char* message;
+  } kBad[] = {
+      {"truncated", [&] { return good.substr(0, 1500); }, "truncated"},
+      {"wrong sum",
+       [] {
+         auto m = good_members();
+         m[2].data = "2026b\n";
+         return tar_bytes(m);
+       },
+       "does not match its SHA-256 sum"},
+      {"no manifest",
+       [] {
+         auto m = good_members();
+         m.erase(m.begin());
+         return tar_bytes(m);
+       },
+       "no manifest"},
+      {"dot-dot path",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/../../etc", '5', ""});
+         return tar_bytes(m);
+       },
+       "leaves the data set"},
+      {"absolute path",
+       [] {
+         auto m = good_members();
+         m.push_back({"/etc/x", '5', ""});
+         return tar_bytes(m);
+       },
+       "leaves the data set"},
+      {"absolute link",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/L", '2', "/etc/passwd"});
+         return tar_bytes(m);
+       },
+       "leaves the data set"},
+      {"link climbing out",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/L", '2', "../../x"});
+         return tar_bytes(m);
+       },
+       "leaves the data set"},
+      {"character device",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/null", '3', ""});
+         return tar_bytes(m);
+       },
+       "device file"},
+      {"block device",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/sda", '4', ""});
+         return tar_bytes(m);
+       },
+       "device file"},
+      {"FIFO",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/fifo", '6', ""});
+         return tar_bytes(m);
+       },
+       "FIFO"},
+      {"hard link",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/H", '1', "zoneinfo/+VERSION"});
+         return tar_bytes(m);
+       },
+       "neither a directory"},
+      {"bad checksum",
+       [&] {
+         std::string b = good;
+         b[0] = 'X';
+         return b;
+       },
+       "bad checksum"},
+      {"not tar", [] { return std::string(2048, 'z'); }, "not a ustar"},
+  };
+  for (const auto& bad : kBad) {
+    const scratch_dir dir;
+    write_gzip(dir / "a.tgz", bad.bytes());
+    try {
+      (void)read_set_archive(dir / "a.tgz");
+      ADD_FAILURE() << "accepted: " << bad.name;
+    } catch (const std::runtime_error& e) {
+      EXPECT_NE(std::string(e.what()).find(bad.message), std::string::npos)
+          << bad.name << ": " << e.what();
+    }
+  }
+}
+
+TEST(set_archive_test, a_truncated_gzip_stream_is_refused) {
+  const scratch_dir dir;
+  write_gzip(dir / "whole.tgz", tar_bytes(good_members()));
+  const std::string whole = tree::file_content(dir / "whole.tgz");
+  tree::write_file(dir / "cut.tgz", whole.substr(0, whole.size() / 2));
+  EXPECT_THROW(read_set_archive(dir / "cut.tgz"), std::runtime_error);
+}
+
+TEST(set_archive_test, long_paths_use_the_ustar_prefix) {
+  const std::string path = std::string(120, 'd') + "/" + std::string(90, 'f');
+  const tar_header header(tar_header::make(path, '0', 0644, 7, ""));
+  EXPECT_EQ(header.path, path);
+  EXPECT_EQ(header.size, 7U);
+  EXPECT_THROW(tar_header::make(std::string(300, 'x'), '0', 0644, 0, ""),
+               std::runtime_error);
+}
+
+}  // namespace

@@ -1,0 +1,233 @@
+#include "data/stage_command.h"
+
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/mount.h>
+#include <unistd.h>
+
+#include <functional>
+#include <stdexcept>
+#include <string>
+
+#include "clean_device.h"
+#include "data/child_process.h"
+#include "data/set_archive.h"
+#include "data/set_source.h"
+#include "device_tree.h"
+#include "gtest/gtest.h"
+#include "hand_made_archive.h"
+#include "scratch_dir.h"
+#include "tree.h"
+
+namespace {
+
+// Built from tzdata2026a.tar.gz and ICU's 2026a resources by the test
+// fixture that runs before this binary.
+const std::string kSet = KESTREL_TEST_SET_2026A;
+constexpr char kStaged1[] = "/var/db/timezone/tz/2026a.1.1";
+
+class stage_test : public clean_device {
+ protected:
+  void TearDown() override { (void)umount2("/var/db/timezone", MNT_DETACH); }
+};
+
+std::map<std::string, std::string> whole_device() {
+  auto all = snapshot("/var");
+  all.merge(snapshot("/usr/share"));
+  return all;
+}
+
+// The set's entries, relative to its root.
+std::map<std::string, std::string> relative(const std::string& root) {
+  std::map<std::string, std::string> out;
+  for (const auto& [path, what] : snapshot(root)) {
+    out[path.substr(root.size())] = what;
+  }
+  return out;
+}
+
+TEST_F(stage_test, installs_the_set_and_points_tz_latest_at_it) {
+  make_device("2025b");
+  EXPECT_EQ(stage_set(load_set(kSet)), kStaged1);
+  EXPECT_EQ(tree::link_target("/var/db/timezone/tz_latest"), kStaged1);
+  EXPECT_EQ(relative(kStaged1), relative(kSet));
+  // kestrel's own links are left for kestrel.
+  EXPECT_EQ(tree::link_target("/var/db/timezone/zoneinfo"),
+            "/usr/share/zoneinfo.default");
+  EXPECT_FALSE(tree::present("/var/db/timezone/icutz"));
+  EXPECT_FALSE(tree::present("/var/db/timezone/localtime"));
+  EXPECT_FALSE(tree::present("/var/db/timezone/.tz_latest.new"));
+  const auto names = snapshot("/var/db/timezone/tz");
+  for (const auto& [path, what] : names) {
+    EXPECT_EQ(path.find("/.stage-"), std::string::npos) << path;
+  }
+}
+
+TEST_F(stage_test, kestrel_adopts_the_staged_set_at_its_next_start) {
+  make_device("2025b");
+  (void)stage_set(load_set(kSet));
+  EXPECT_EQ(child_process({KESTREL_BINARY}).run(), 0);
+  EXPECT_EQ(tree::link_target("/var/db/timezone/zoneinfo"),
+            std::string(kStaged1) + "/zoneinfo");
+  EXPECT_EQ(tree::link_target("/var/db/timezone/icutz"),
+            std::string(kStaged1) + "/icutz");
+  EXPECT_EQ(tree::file_content("/var/db/timezone/TZVersionDiffRecord"),
+            "2025b.1.0_2026a.1.1");
+}
+
+TEST_F(stage_test, numbers_a_release_one_above_its_highest_staged_set) {
+  make_device("2025b");
+  tree::make_dir("/var/db/timezone/tz/2026a.1.4");
+  tree::make_dir("/var/db/timezone/tz/2025a.1.9");
+  EXPECT_EQ(stage_set(load_set(kSet)), "/var/db/timezone/tz/2026a.1.5");
+  EXPECT_EQ(stage_set(load_set(kSet)), "/var/db/timezone/tz/2026a.1.6");
+}
+
+TEST_F(stage_test, removes_the_scratch_an_earlier_staging_left) {
+  make_device("2025b");
+  tree::write_file("/var/db/timezone/tz/.stage-AbC123/zoneinfo/x", "partial");
+  (void)stage_set(load_set(kSet));
+  EXPECT_FALSE(tree::present("/var/db/timezone/tz/.stage-AbC123"));
+}
+
+TEST_F(stage_test, stages_a_packed_archive) {
+  make_device("2025b");
+  const scratch_dir dir;
+  write_set_archive(load_set(kSet), dir / "set.tgz");
+  EXPECT_EQ(stage_set(load_set(dir / "set.tgz")), kStaged1);
+  EXPECT_EQ(relative(kStaged1), relative(kSet));
+}
+
+// Each refusal: how the device is made, what is staged, what the message
+// says. The device is compared whole before and after.
+struct refusal {
+  const char* name;
+  std::function<void()> make;
+  std::function<std::string(const scratch_dir&)> source;
+  const char* message;
+};
+
+std::string the_set(const scratch_dir& /*dir*/) { return kSet; }
+
+std::string hand_made(const scratch_dir& dir, const std::vector<raw_member>& m) {
+  write_gzip(dir / "bad.tgz", tar_bytes(m));
+  return dir / "bad.tgz";
+}
+
+int held_lock = -1;
+
+const refusal kRefusals[] = {
+    {"system partition of the same release", [] { make_device("2026a"); },
+     the_set, "release 2026a is not newer than 2026a.1.0 of the system partition"},
+    {"system partition newer", [] { make_device("2026b"); }, the_set,
+     "not newer than 2026b.1.0 of the system partition"},
+    {"links designate a set of the same release",
+     [] {
+       make_device("2025b");
+       tree::make_dir("/var/db/timezone/tz/2026a.1.1/icutz");
+       (void)unlink("/var/db/timezone/zoneinfo");
+       tree::make_link("/var/db/timezone/tz/2026a.1.1/zoneinfo",
+                       "/var/db/timezone/zoneinfo");
+     },
+     the_set, "not newer than 2026a.1.1, the set the links designate"},
+    {"another ICU schema", [] { make_device("2025b", "72l"); }, the_set,
+     "its ICU schema \"44l\" is not the system partition's \"72l\""},
+    {"another staging running",
+     [] {
+       make_device("2025b");
+       held_lock = open("/var/db/timezone/.kestrel-data.lock",
+                        O_RDWR | O_CREAT | O_CLOEXEC, 0600);
+       ASSERT_EQ(flock(held_lock, LOCK_EX), 0);
+     },
+     the_set, "another staging is running"},
+    {"no room for the set",
+     [] {
+       ASSERT_EQ(mount("small", "/var/db/timezone", "tmpfs", 0, "size=256k"), 0);
+       make_device("2025b");
+     },
+     the_set, "the set needs"},
+    // Verification runs on the copy in tz/, so a device that has staged
+    // before (its lock file and tz/ there) is left exactly as it was.
+    {"a set that fails verification",
+     [] {
+       make_device("2025b");
+       tree::write_file("/var/db/timezone/.kestrel-data.lock", "", 0600);
+       tree::make_dir("/var/db/timezone/tz");
+     },
+     [](const scratch_dir& dir) {
+       // ICU's 2026a resources under zone files that claim 2026c.
+       (void)child_process({"cp", "-a", kSet, dir / "set"}).run();
+       tree::write_file(dir / "set/zoneinfo/+VERSION", "2026c\n");
+       return dir / "set";
+     },
+     "does not pass verification"},
+    {"truncated archive", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       write_set_archive(load_set(kSet), dir / "whole.tgz");
+       const std::string whole = tree::file_content(dir / "whole.tgz");
+       tree::write_file(dir / "cut.tgz", whole.substr(0, whole.size() / 2));
+       return dir / "cut.tgz";
+     },
+     "truncated or corrupt"},
+    {"wrong sums", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       auto m = good_members();
+       m[2].data = "2026b\n";
+       return hand_made(dir, m);
+     },
+     "does not match its SHA-256 sum"},
+    {"path with ..", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       auto m = good_members();
+       m.push_back({"zoneinfo/../../../etc/x", '5', ""});
+       return hand_made(dir, m);
+     },
+     "leaves the data set"},
+    {"absolute link", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       auto m = good_members();
+       m.push_back({"zoneinfo/L", '2', "/etc/passwd"});
+       return hand_made(dir, m);
+     },
+     "leaves the data set"},
+    {"device file", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       auto m = good_members();
+       m.push_back({"zoneinfo/null", '3', ""});
+       return hand_made(dir, m);
+     },
+     "device file"},
+    {"FIFO", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       auto m = good_members();
+       m.push_back({"zoneinfo/fifo", '6', ""});
+       return hand_made(dir, m);
+     },
+     "FIFO"},
+};
+
+TEST_F(stage_test, refuses_with_a_clear_message_and_changes_nothing) {
+  for (const refusal& r : kRefusals) {
+    SCOPED_TRACE(r.name);
+    (void)umount2("/var/db/timezone", MNT_DETACH);
+    clean_device::SetUp();
+    r.make();
+    const scratch_dir dir;
+    const std::string source = r.source(dir);
+    const auto before = whole_device();
+    try {
+      (void)stage_set(load_set(source));
+      ADD_FAILURE() << "staged";
+    } catch (const std::runtime_error& e) {
+      EXPECT_NE(std::string(e.what()).find(r.message), std::string::npos)
+          << e.what();
+    }
+    EXPECT_EQ(whole_device(), before);
+    if (held_lock >= 0) {
+      (void)close(held_lock);
+      held_lock = -1;
+    }
+  }
+}
+
+}  // namespace
