@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "data/build_command.h"
+#include "data/clean.h"
 #include "data/pack_command.h"
 #include "data/set_zone.h"
 #include "data/stage_command.h"
@@ -47,7 +48,7 @@ int main(int argc, char** argv) {
     }
   }
   std::fputs(
-      "usage: kestrel-data build|verify|pack|stage|status|set-zone ...\n"
+      "usage: kestrel-data build|verify|pack|stage|status|set-zone|clean ...\n"
       "see kestrel-data(1)\n",
       stderr);
   return 2;
