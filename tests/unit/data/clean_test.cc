@@ -1,7 +1,6 @@
 #include "data/clean.h"
 
 #include <fcntl.h>
-#include <sys/file.h>
 #include <sys/mount.h>
 #include <unistd.h>
 
@@ -12,6 +11,7 @@
 #include <vector>
 
 #include "clean_device.h"
+#include "data/staging_lock.h"
 #include "device_tree.h"
 #include "gtest/gtest.h"
 #include "tree.h"
@@ -282,10 +282,7 @@ INSTANTIATE_TEST_SUITE_P(clean, clean_refusal_test,
                          });
 
 TEST_F(clean_test, removes_nothing_while_another_command_holds_the_lock) {
-  const int fd = open("/var/db/timezone/.kestrel-data.lock",
-                      O_RDWR | O_CREAT | O_CLOEXEC, 0600);
-  ASSERT_GE(fd, 0);
-  ASSERT_EQ(flock(fd, LOCK_EX), 0);
+  const staging_lock other;
   auto before = snapshot("/var/db/timezone");
   EXPECT_EQ(run(), 1);
   EXPECT_EQ(err.str(),
@@ -293,7 +290,6 @@ TEST_F(clean_test, removes_nothing_while_another_command_holds_the_lock) {
             "device; nothing removed\n");
   before.erase(kMarker);
   EXPECT_EQ(snapshot("/var/db/timezone"), before);
-  close(fd);
 }
 
 TEST_F(clean_test, never_follows_a_link_out_of_a_removed_set) {

@@ -1,16 +1,18 @@
 #include "data/set_zone.h"
 
 #include <fcntl.h>
-#include <sys/file.h>
 #include <sys/mount.h>
 #include <unistd.h>
 
 #include <functional>
+#include <map>
 #include <sstream>
 #include <string>
 #include <vector>
 
 #include "clean_device.h"
+#include "data/staging_lock.h"
+#include "device_tree.h"
 #include "gtest/gtest.h"
 #include "tree.h"
 
@@ -189,30 +191,20 @@ void PrintTo(const refusal& param, std::ostream* os) { *os << param.name; }
 class set_zone_refusal_test : public set_zone_test,
                               public testing::WithParamInterface<refusal> {};
 
-// The whole device as it stands: every entry under /var, /usr/share and /etc
-// with its kind and link target; but kestrel-data's lock file, which its
+// The whole device as it stands, but kestrel-data's lock file, which its
 // commands create and leave.
-std::string device_listing() {
-  std::string listing;
+std::map<std::string, std::string> device_listing() {
+  std::map<std::string, std::string> listing;
   for (const char* dir : {"/var", "/usr/share", "/etc"}) {
-    const std::string command =
-        std::string("find ") + dir +
-        " ! -name .kestrel-data.lock -printf '%p %y %l\\n' | sort";
-    FILE* pipe = popen(command.c_str(), "r");
-    char line[512];
-    while (pipe != nullptr && fgets(line, sizeof(line), pipe) != nullptr) {
-      listing += line;
-    }
-    if (pipe != nullptr) {
-      pclose(pipe);
-    }
+    listing.merge(snapshot(dir));
   }
+  listing.erase("/var/db/timezone/.kestrel-data.lock");
   return listing;
 }
 
 TEST_P(set_zone_refusal_test, says_why_and_changes_nothing) {
   GetParam().setup();
-  const std::string before = device_listing();
+  const auto before = device_listing();
   EXPECT_EQ(run(GetParam().zone), 1);
   EXPECT_EQ(err.str(), GetParam().message);
   EXPECT_EQ(out.str(), "");
@@ -226,17 +218,13 @@ INSTANTIATE_TEST_SUITE_P(set_zone, set_zone_refusal_test,
                          });
 
 TEST_F(set_zone_test, refuses_while_another_command_holds_the_lock) {
-  const int fd = open("/var/db/timezone/.kestrel-data.lock",
-                      O_RDWR | O_CREAT | O_CLOEXEC, 0644);
-  ASSERT_GE(fd, 0);
-  ASSERT_EQ(flock(fd, LOCK_EX), 0);
+  const staging_lock other;
   EXPECT_EQ(run("Europe/Paris"), 1);
   EXPECT_EQ(err.str(),
             "kestrel-data set-zone: another kestrel-data command is changing "
             "the device; try again when it is done\n");
   EXPECT_EQ(tree::link_target(kLocaltime),
             "/var/db/timezone/zoneinfo/Asia/Tokyo");
-  close(fd);
 }
 
 }  // namespace
