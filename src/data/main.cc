@@ -23,8 +23,10 @@ struct subcommand {
 };
 
 constexpr subcommand kSubcommands[] = {
-    {"build", run_build}, {"verify", run_verify}, {"pack", run_pack},
-    {"stage", run_stage}, {"status", run_status},
+    {"build", run_build},       {"verify", run_verify},
+    {"pack", run_pack},         {"stage", run_stage},
+    {"status", run_status},     {"set-zone", data::run_set_zone},
+    {"clean", data::run_clean},
 };
 
 }  // namespace
