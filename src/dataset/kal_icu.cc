@@ -46,8 +46,11 @@ std::string data_file_schema(const std::string& icu_path) {
   char* const roots[] = {root.data(), nullptr};
   // A linked ICU directory is followed, but no link inside it, and the walk
   // stays on the data set's file system. Without a comparison the directory's
-  // own order decides which data file wins.
-  FTS* walk = fts_open(roots, FTS_COMFOLLOW | FTS_PHYSICAL | FTS_XDEV, nullptr);
+  // own order decides which data file wins. The walk never changes directory:
+  // it looks at each entry by its whole path, which spares the calls to open
+  // the starting directory and to change into and back out of each one.
+  FTS* walk = fts_open(
+      roots, FTS_COMFOLLOW | FTS_NOCHDIR | FTS_PHYSICAL | FTS_XDEV, nullptr);
   if (walk == nullptr) {
     warn("ka_icu::initialize: fts_open of %s failed, %s", icu_path.c_str(),
          std::strerror(errno));

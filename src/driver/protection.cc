@@ -5,10 +5,12 @@
 
 #include "fs/paths.h"
 
+#ifdef F_SETPROTECTIONCLASS
+
 namespace {
 
 // Data-protection class D: no protection.
-[[maybe_unused]] constexpr int kProtectionClassD = 4;
+constexpr int kProtectionClassD = 4;
 
 }  // namespace
 
@@ -17,13 +19,18 @@ void set_protection_class(const char* path) {
   if (fd == -1) {
     return;
   }
-#ifdef F_SETPROTECTIONCLASS
   (void)fcntl(fd, F_SETPROTECTIONCLASS, kProtectionClassD);
-#endif
-  // Where the platform has no protection classes every file is readable
-  // without unlocking, which is what class D asks for: nothing to set.
   close(fd);
 }
+
+#else
+
+// Where the platform has no protection classes every file is readable
+// without unlocking, which is what class D asks for: there is nothing to set,
+// so the step makes no call at all.
+void set_protection_class(const char* /*path*/) {}
+
+#endif
 
 void protect_data_directories() {
   set_protection_class(paths::kTimezoneDir);

@@ -60,8 +60,9 @@ TEST_F(kal_icu_walk_failure, update_walk_is_asked_as_the_device_needs) {
   EXPECT_EQ(raised_by([] { kal_icu icu(kStaged); }), EMFILE);
   EXPECT_EQ(walks, 1);
   EXPECT_EQ(walk_root, kStagedIcu);
-  EXPECT_EQ(walk_options, FTS_COMFOLLOW | FTS_PHYSICAL | FTS_XDEV);
-  EXPECT_EQ(walk_options, 0x51);
+  EXPECT_EQ(walk_options,
+            FTS_COMFOLLOW | FTS_NOCHDIR | FTS_PHYSICAL | FTS_XDEV);
+  EXPECT_EQ(walk_options, 0x55);
   EXPECT_FALSE(walk_sorted);
   EXPECT_EQ(err.text(), walk_failure(EMFILE));
 }
