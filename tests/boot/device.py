@@ -4,6 +4,7 @@ comparison."""
 
 import hashlib
 import os
+import shutil
 import signal
 import stat
 import subprocess
@@ -64,6 +65,18 @@ def tree_of_tar(archive):
             else:
                 tree[path] = ("other", member.type.decode())
     return tree
+
+
+def bare_root(prepared, work):
+    """A device root in WORK with only the system partition of the prepared
+    test system (hard-linked), for the state to be laid out on."""
+    root = os.path.join(work, "device")
+    shutil.rmtree(root, ignore_errors=True)
+    os.makedirs(os.path.join(root, "usr/share"))
+    for entry in ("zoneinfo.default", "icu"):
+        subprocess.run(["cp", "-al", os.path.join(prepared, "usr/share", entry),
+                        os.path.join(root, "usr/share")], check=True)
+    return root
 
 
 def run_kestrel(root, kestrel):

@@ -23,12 +23,7 @@ def packaged_kestrel(deb, work):
 def sandbox_runs(prepared, work, name, kestrel):
     """The state on a bare device root, run twice: per run the lines, the
     var/db tree and what date and zdump report."""
-    root = os.path.join(work, "device")
-    shutil.rmtree(root, ignore_errors=True)
-    os.makedirs(os.path.join(root, "usr/share"))
-    for entry in ("zoneinfo.default", "icu"):
-        subprocess.run(["cp", "-al", os.path.join(prepared, "usr/share", entry),
-                        os.path.join(root, "usr/share")], check=True)
+    root = device.bare_root(prepared, work)
     states.lay_out(root, name)
     runs = []
     for _ in range(2):

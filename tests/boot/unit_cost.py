@@ -91,12 +91,7 @@ def cost_image(prepared, work, shipped, order, program):
 
 def expected_lines(prepared, work, kestrel):
     """kestrel's lines on the common start, from the device sandbox."""
-    root = os.path.join(work, "device")
-    shutil.rmtree(root, ignore_errors=True)
-    os.makedirs(os.path.join(root, "usr/share"))
-    for entry in ("zoneinfo.default", "icu"):
-        subprocess.run(["cp", "-al", os.path.join(prepared, "usr/share", entry),
-                        os.path.join(root, "usr/share")], check=True)
+    root = device.bare_root(prepared, work)
     os.makedirs(os.path.join(root, states.TZ, "tz"))
     common_start(root, states.release_of(root))
     lines, status = device.run_kestrel(root, kestrel)
