@@ -29,11 +29,13 @@ def common_start(root, release):
     """The current data is the latest staged update: kestrel changes
     nothing and warns that the update is not newer, on every start."""
     update = states.stage(root, release + ".1.1", release)
+    zone = "/var/db/timezone/zoneinfo/Europe/Paris"
     for name, target in (("zoneinfo", update + "/zoneinfo"),
                          ("icutz", update + "/icutz"), ("tz_latest", update),
-                         ("localtime", "/var/db/timezone/zoneinfo/Europe/Paris")):
+                         ("localtime", zone)):
         states.link(root, f"{states.TZ}/{name}", target)
-    with open(os.path.join(root, states.TZ, "TZVersionDiffRecord"), "w") as out:
+    record = os.path.join(root, states.TZ, "TZVersionDiffRecord")
+    with open(record, "w") as out:
         out.write(f"{release}.1.0_{release}.1.1")
 
 
@@ -53,7 +55,8 @@ def write(path, text):
 
 
 def install_variants(root, shipped, order):
-    os.remove(os.path.join(root, UNITS, "sysinit.target.wants/kestrel.service"))
+    wants = os.path.join(root, UNITS, "sysinit.target.wants")
+    os.remove(os.path.join(wants, "kestrel.service"))
     warmup = unit_variants.unit_text(shipped, {}, KESTREL, None)
     write(os.path.join(root, UNITS, WARMUP),
           warmup.replace(f"ExecStart={KESTREL}",
@@ -68,8 +71,7 @@ def install_variants(root, shipped, order):
                 write(os.path.join(root, UNITS, unit + ".d/variant.conf"),
                       one.dropin)
             after = unit
-        os.symlink("../" + unit,
-                   os.path.join(root, UNITS, "sysinit.target.wants", unit))
+        os.symlink("../" + unit, os.path.join(wants, unit))
 
 
 def cost_image(prepared, work, shipped, order, program):

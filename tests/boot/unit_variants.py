@@ -104,7 +104,8 @@ def unit_text(shipped, service, program, after):
         if section == "[Service]":
             entries = [(k, program if k == "ExecStart" else v)
                        for k, v in entries if k in RUN]
-            entries += [(k, v) for k, values in service.items() for v in values]
+            entries += [(k, v) for k, values in service.items()
+                        for v in values]
         lines += [f"{key}={value}" for key, value in entries]
         if section == "[Unit]" and after:
             lines.append(f"After={after}")
