@@ -9,6 +9,8 @@
 #include "driver/protection.h"
 #include "fs/paths.h"
 
+// The two aborts: the outer guard's reset or the default localtime link
+// fails, and its exception leaves main for std::terminate (SIGABRT).
 int main() {
   protect_data_directories();
   migrate_legacy_icutz();

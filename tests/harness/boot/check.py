@@ -1,0 +1,166 @@
+"""Checks one boot's results against the state's expectations and against
+the device sandbox's run of the same state with the same binary. Each check
+returns the list of what is wrong."""
+
+import json
+import os
+
+from .. import tree as trees
+
+STARTING = "7d4958e842da4a758f6c1cdc7b36dcc5"  # systemd's "Starting ..." job
+# Ordinary services of the test system that read the local time.
+READERS = ["cron.service", "systemd-timesyncd.service"]
+
+
+def read_show(path):
+    """systemctl show output: one dict per unit, split on blank lines."""
+    units, unit = [], {}
+    with open(path) as show:
+        for line in show.read().splitlines() + [""]:
+            if not line:
+                if unit:
+                    units.append(unit)
+                unit = {}
+                continue
+            key, _, value = line.partition("=")
+            unit[key] = value
+    return units
+
+
+def read_journal(path):
+    with open(path) as journal:
+        return [json.loads(line) for line in journal if line.strip()]
+
+
+class results:
+    """One boot's results as the collector wrote them."""
+
+    def __init__(self, directory):
+        self.directory = directory
+        self.kestrel = read_show(os.path.join(directory, "kestrel.show"))[0]
+        self.units = {
+            unit["Id"]: unit
+            for unit in read_show(os.path.join(directory, "units.show"))
+        }
+        self.journal = read_journal(os.path.join(directory, "journal.json"))
+        self.date = self.lines("date")
+        self.zdump = self.lines("zdump")
+
+    def lines(self, name):
+        with open(os.path.join(self.directory, name)) as text:
+            return text.read().splitlines()
+
+    def warnings(self):
+        return [
+            entry["MESSAGE"]
+            for entry in self.journal
+            if entry.get("_SYSTEMD_UNIT") == "kestrel.service"
+        ]
+
+    def microseconds(self, key, unit=None):
+        return int((self.units[unit] if unit else self.kestrel).get(key) or 0)
+
+    def duration_ms(self):
+        return (
+            self.microseconds("ExecMainExitTimestampMonotonic")
+            - self.microseconds("ExecMainStartTimestampMonotonic")
+        ) / 1000
+
+
+def unit_ran_once(got):
+    wrong = []
+    want = {
+        "Result": "success",
+        "ExecMainStatus": "0",
+        "ExecMainCode": "1",
+        "ActiveState": "active",
+        "NRestarts": "0",
+    }
+    for key, value in want.items():
+        if got.kestrel.get(key) != value:
+            wrong.append(
+                f"kestrel.service {key}={got.kestrel.get(key)}, " f"expected {value}"
+            )
+    starts = [
+        entry
+        for entry in got.journal
+        if entry.get("UNIT") == "kestrel.service"
+        and entry.get("MESSAGE_ID") == STARTING
+    ]
+    if len(starts) != 1:
+        wrong.append(f"the journal holds {len(starts)} starts of kestrel")
+    pids = {
+        entry.get("_PID")
+        for entry in got.journal
+        if entry.get("_SYSTEMD_UNIT") == "kestrel.service"
+    }
+    if len(pids) > 1:
+        wrong.append(f"kestrel wrote from {len(pids)} processes")
+    return wrong
+
+
+def warnings_match(got, sandbox_lines, expected):
+    wrong = []
+    lines = got.warnings()
+    if lines != sandbox_lines:
+        wrong.append(
+            f"journal lines {lines} differ from the device "
+            f"sandbox's {sandbox_lines}"
+        )
+    if expected is not None:
+        prefixes = [line.rsplit(": ", 1)[0] for line in lines]
+        if prefixes != ["kestrel: " + text for text in expected]:
+            wrong.append(f"warnings {lines}, expected {expected}")
+    return wrong
+
+
+def finished_first(got):
+    end = got.microseconds("ExecMainExitTimestampMonotonic")
+    if not end:
+        return ["kestrel has no exit time"]
+    wrong = []
+    sysinit = got.microseconds("ActiveEnterTimestampMonotonic", "sysinit.target")
+    if not end < sysinit:
+        wrong.append(f"kestrel ended at {end} us, sysinit.target at {sysinit}")
+    for reader in READERS:
+        start = got.microseconds("InactiveExitTimestampMonotonic", reader)
+        if not end < start:
+            wrong.append(f"kestrel ended at {end} us, {reader} started at {start}")
+    return wrong
+
+
+def tree_matches(tree, sandbox_tree, expected):
+    wrong = []
+
+    def show(path, entry):
+        return "absent" if entry is None else trees.describe(path, entry)
+
+    for path in sorted(set(tree) | set(sandbox_tree)):
+        if tree.get(path) != sandbox_tree.get(path):
+            wrong.append(
+                f"booted {show(path, tree.get(path))}, "
+                f"sandbox {show(path, sandbox_tree.get(path))}"
+            )
+    for path, target in expected["links"].items():
+        if tree.get(path) != ("link", target):
+            wrong.append(f"{show(path, tree.get(path))}, expected link to {target}")
+    for path, content in expected["files"].items():
+        entry = tree.get(path)
+        if entry is None or entry[0] != "file" or entry[2] != content:
+            wrong.append(f"{show(path, entry)}, expected {content!r}")
+    for path in expected["absent"]:
+        if path in tree:
+            wrong.append(f"{show(path, tree[path])}, expected absent")
+    return wrong
+
+
+def local_time_matches(got, sandbox_dates, sandbox_zdump, expected):
+    wrong = []
+    if got.date != expected["date"] or sandbox_dates != expected["date"]:
+        wrong.append(
+            f"date reports {got.date} (sandbox {sandbox_dates}), "
+            f"expected {expected['date']}"
+        )
+    if got.zdump != sandbox_zdump:
+        wrong.append(f"zdump reports {got.zdump}, sandbox {sandbox_zdump}")
+    return wrong
