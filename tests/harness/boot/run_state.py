@@ -126,7 +126,7 @@ def run_state(name, prepared, deb, work, log):
                 f"{name}: the device sandbox's run {number} ended with "
                 f"{run['status']} {run['lines']}"
             )
-    wrong, trees = [], []
+    wrong, booted = [], []
     for number, run in enumerate(runs, 1):
         boot_name = f"boot{number}"
         try:
@@ -144,14 +144,14 @@ def run_state(name, prepared, deb, work, log):
         )
         if number == 2:
             expected = dict(expected, warnings=None, files={}, absent=[])
-            if links_and_record(tree) != links_and_record(trees[0]):
+            if links_and_record(tree) != links_and_record(booted[0]):
                 wrong.append(
                     "boot2: the second boot changed the links or " "the record"
                 )
         wrong += [
             f"{boot_name}: {text}" for text in check_boot(got, run, expected, tree)
         ]
-        trees.append(tree)
+        booted.append(tree)
     if wrong:
         log(f"{name}: FAILED\n  " + "\n  ".join(wrong))
         for number in (1, 2):
