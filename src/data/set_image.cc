@@ -152,7 +152,9 @@ std::string set_image::schema() const {
   for (const set_member& member : entries) {
     if (member.type == set_member::kind::file &&
         member.path.starts_with("icutz/")) {
-      const auto schema = icu_data_file_schema(member.path.substr(6));
+      // The schema is a view into the name, which must outlive it.
+      const std::string name = member.path.substr(6);
+      const auto schema = icu_data_file_schema(name);
       if (schema) {
         return std::string(*schema);
       }
