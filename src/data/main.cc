@@ -8,7 +8,9 @@
 #include <vector>
 
 #include "data/build_command.h"
+#include "data/clean.h"
 #include "data/pack_command.h"
+#include "data/set_zone.h"
 #include "data/stage_command.h"
 #include "data/status_command.h"
 #include "data/usage_error.h"
@@ -22,8 +24,10 @@ struct subcommand {
 };
 
 constexpr subcommand kSubcommands[] = {
-    {"build", run_build}, {"verify", run_verify}, {"pack", run_pack},
-    {"stage", run_stage}, {"status", run_status},
+    {"build", run_build},       {"verify", run_verify},
+    {"pack", run_pack},         {"stage", run_stage},
+    {"status", run_status},     {"set-zone", data::run_set_zone},
+    {"clean", data::run_clean},
 };
 
 }  // namespace
@@ -50,7 +54,7 @@ int main(int argc, char** argv) {
     }
   }
   (void)std::fputs(
-      "usage: kestrel-data build|verify|pack|stage|status ...\n"
+      "usage: kestrel-data build|verify|pack|stage|status|set-zone|clean ...\n"
       "see kestrel-data(1)\n",
       stderr);
   return 2;

@@ -15,7 +15,7 @@ constexpr char kLockFile[] = "/var/db/timezone/.kestrel-data.lock";
 
 }  // namespace
 
-staging_lock::staging_lock()
+staging_lock::staging_lock(const char* busy)
     : fd(open(kLockFile, O_RDWR | O_CREAT | O_CLOEXEC, 0600)) {
   if (fd < 0) {
     throw std::runtime_error(std::string("cannot open ") + kLockFile + ": " +
@@ -25,7 +25,7 @@ staging_lock::staging_lock()
     const int saved = errno;
     (void)close(fd);
     throw std::runtime_error(saved == EWOULDBLOCK
-                                 ? "another staging is running; nothing staged"
+                                 ? std::string(busy)
                                  : std::string("cannot lock ") + kLockFile +
                                        ": " + std::strerror(saved));
   }
