@@ -2,8 +2,9 @@
 tz 2026a built with ICU's own 2026a resources, staged and adopted, and read
 through the device's links; tz 2026c with ICU's 2026a resources refused by
 the verification gate; tz 2026c built with the project's converter, staged
-and adopted. kestrel-data runs on the device's fixed paths inside the device
-sandbox (--reader), like every program that reads the links."""
+and adopted; then the clean-up agent keeps only the set in use.
+kestrel-data runs on the device's fixed paths inside the device sandbox
+(--reader), like every program that reads the links."""
 
 import os
 import subprocess
@@ -89,6 +90,8 @@ def lifecycle(root, binaries):
             lambda: life.build("2026c", "2026a", expect_success=False),
             lambda: life.build_stage_and_start("2026c", None),
             lambda: life.readers("after adopting 2026c"),
+            lambda: step("clean up", life.on_device(life.data, "clean")),
+            lambda: step("kestrel-data status", life.on_device(life.data, "status")),
         )
         passed = all(each() for each in steps)
     if not passed:
