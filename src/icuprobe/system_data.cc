@@ -22,7 +22,7 @@ std::string write_system_data(const std::string& dir) {
                                              : "data entry point"));
   }
   const auto* symbol = static_cast<const ElfW(Sym)*>(entry);
-  const std::string path = dir + "/" + U_ICUDATA_NAME + ".dat";
+  std::string path = dir + "/" + U_ICUDATA_NAME + ".dat";
   std::ofstream out(path, std::ios::binary | std::ios::trunc);
   out.write(U_ICUDATA_ENTRY_POINT,
             static_cast<std::streamsize>(symbol->st_size));
