@@ -1,16 +1,20 @@
 """Shows that kestrel.service's sandbox lets kestrel do its whole job.
 
-    python3 -m harness.check_sandbox_trace UNIT KESTREL SCENARIO...
+    python3 -m harness.check_sandbox_trace [--dropin FILE]... UNIT KESTREL \
+        SCENARIO...
 
 Where systemd is not the init system, the unit cannot be started; instead
 every scenario is run (harness.run_scenario, through the device sandbox)
 with kestrel under strace, and its system calls are checked against the
-unit's directives:
+unit's directives (with each --dropin FILE read after it, as systemd reads
+the unit's drop-ins):
 
 - every system call is allowed by its SystemCallFilter= lines, the groups
-  resolved by `systemd-analyze syscall-filter`;
+  resolved by `systemd-analyze syscall-filter` (without a filter, any);
 - every path it creates, removes or opens for writing lies under one of its
-  ReadWritePaths= (ProtectSystem=strict leaves everything else read-only);
+  ReadWritePaths= (ProtectSystem=strict leaves everything else read-only;
+  a unit without it lets kestrel write anywhere, and kestrel is held to
+  /var/db, where everything it changes lies);
 - it touches nothing that ProtectHome=, PrivateDevices=, ProtectKernel*= or
   ProcSubset=pid hide;
 - it never maps memory writable and executable (MemoryDenyWriteExecute=) and
@@ -37,15 +41,28 @@ VISIBLE = (
 )
 
 
-def unit_directives(unit):
+def unit_directives(*files):
+    """Each key's assignments in the unit and its drop-ins; an empty one
+    resets the list, as systemd has it."""
     directives = {}
-    with open(unit) as text:
-        for line in text:
-            line = line.strip()
-            if line and not line.startswith(("#", ";", "[")):
-                key, _, value = line.partition("=")
-                directives.setdefault(key, []).append(value)
+    for name in files:
+        with open(name) as text:
+            for line in text:
+                line = line.strip()
+                if line and not line.startswith(("#", ";", "[")):
+                    key, _, value = line.partition("=")
+                    directives[key] = directives.get(key, []) + [value] if value else []
     return directives
+
+
+class everything:
+    """The system calls of a unit without a filter."""
+
+    def __contains__(self, name):
+        return True
+
+
+ANY = everything()
 
 
 def syscall_groups():
@@ -86,7 +103,8 @@ def allowed_syscalls(filters, groups):
         if allowed is None:
             if deny:
                 raise SystemExit("a deny-list filter first is not handled")
-            allowed = set(names)
+            # systemd allows its @default set with any allow list.
+            allowed = set(names) | expand(["@default"], groups)
         elif deny:
             allowed -= names
         else:
@@ -143,15 +161,26 @@ def problems(calls, allowed, writable):
 
 
 def main():
-    unit, kestrel = sys.argv[1:3]
-    scenarios = sys.argv[3:]
-    directives = unit_directives(unit)
-    allowed = allowed_syscalls(directives.get("SystemCallFilter", []), syscall_groups())
-    writable = [
-        p.lstrip("-+") for v in directives.get("ReadWritePaths", []) for p in v.split()
-    ]
+    arguments, dropins = sys.argv[1:], []
+    while arguments[0] == "--dropin":
+        dropins.append(arguments[1])
+        arguments = arguments[2:]
+    unit, kestrel = arguments[:2]
+    scenarios = arguments[2:]
+    directives = unit_directives(unit, *dropins)
+    filters = directives.get("SystemCallFilter", [])
+    allowed = allowed_syscalls(filters, syscall_groups()) if filters else ANY
+    writable = (
+        [
+            p.lstrip("-+")
+            for v in directives.get("ReadWritePaths", [])
+            for p in v.split()
+        ]
+        if directives.get("ProtectSystem") == ["strict"]
+        else ["/var/db"]
+    )
     if not allowed or not writable:
-        print("the unit has no SystemCallFilter= or no ReadWritePaths=")
+        print("the unit leaves no system call or no path writable")
         return 1
     failed, used = False, set()
     for scenario in scenarios:

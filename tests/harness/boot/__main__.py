@@ -4,22 +4,34 @@ second start changes nothing), each boot checked against the device
 sandbox's run of the same state with the same binary.
 
     tools/boot-test [--build-dir DIR] [--package-dir DIR] [STATE...]
-    python3 -m harness.boot [--build-dir DIR] [--package-dir DIR] [STATE...]
+                    [--dropin NAME] [--cost-boots N] [--unit-cost]
+    python3 -m harness.boot [the same]
 
 Runs as root (mmdebstrap, dpkg --root, mkfs.ext4 -d). Needs the packages of
 `tools/install-deps boot`. The package is the kestrel .deb in --package-dir,
 or one built from the tracked tree with tools/build-package. The base system
 is cached in DIR/cache; each
 boot's serial log stays in DIR/states/STATE. Exits 1 if any check fails.
+
+--dropin NAME boots the states with the package's example drop-in NAME
+(/usr/share/doc/kestrel/examples/NAME.conf) installed for kestrel.service.
+After the states it boots the common start --cost-boots times (default 3)
+with the shipped unit and the plain unit (same ordering, no sandboxing),
+each starting kestrel and a static do-nothing program, and prints what the
+unit costs against both (unit_cost.py). --unit-cost boots no state and
+measures every variant: also each drop-in the package ships, each group of
+the full sandbox's directives on its own and the points between them
+(default 5 boots).
 """
 
 import argparse
 import os
+import shutil
 import sys
 import time
 
 from ..states import boot as states
-from . import base, image, package
+from . import base, image, package, unit_cost_main
 from .run_state import run_state
 
 TOOLS = [
@@ -41,8 +53,13 @@ def main():
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--build-dir", default="build/boot")
     parser.add_argument("--package-dir")
-    parser.add_argument("states", nargs="*", default=list(states.STATES))
+    parser.add_argument("--dropin")
+    parser.add_argument("--cost-boots", type=int)
+    parser.add_argument("--unit-cost", action="store_true")
+    parser.add_argument("states", nargs="*")
     options = parser.parse_args()
+    if not options.states and not options.unit_cost:
+        options.states = list(states.STATES)
     unknown = [name for name in options.states if name not in states.STATES]
     if unknown or os.geteuid() != 0:
         parser.error(
@@ -72,21 +89,29 @@ def main():
     )
     prepared = os.path.join(work, "prepared")
     image.prepare(base_root, prepared, deb)
+    if options.dropin:
+        dropins = os.path.join(prepared, "etc/systemd/system/kestrel.service.d")
+        os.makedirs(dropins)
+        examples = os.path.join(prepared, "usr/share/doc/kestrel/examples")
+        shutil.copy(os.path.join(examples, options.dropin + ".conf"), dropins)
     log(f"test system ready in {time.monotonic() - started:.0f} s")
 
     rows = [run_state(name, prepared, deb, work, log) for name in options.states]
-    print(
-        f"\n{'state':32} {'result':6} {'image':>6} {'boot 1':>7} "
-        f"{'boot 2':>7} {'kestrel 1':>10} {'kestrel 2':>10}"
-    )
+    if rows:
+        print(
+            f"\n{'state':32} {'result':6} {'image':>6} {'boot 1':>7} "
+            f"{'boot 2':>7} {'kestrel 1':>10} {'kestrel 2':>10}"
+        )
     for row in rows:
         print(
             f"{row['name']:32} {row['result']:6} {row['image']:5.0f}s "
             f"{row['boot1']:6.0f}s {row['boot2']:6.0f}s "
             f"{row['kestrel1']:8.1f}ms {row['kestrel2']:8.1f}ms"
         )
+    costs_ran = unit_cost_main.run(prepared, deb, work, options, log)
     log(f"all done in {time.monotonic() - started:.0f} s")
-    return 0 if all(row["result"] == "passed" for row in rows) else 1
+    passed = all(row["result"] == "passed" for row in rows)
+    return 0 if costs_ran and passed else 1
 
 
 if __name__ == "__main__":

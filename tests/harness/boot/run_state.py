@@ -45,9 +45,9 @@ def read_local_time(root):
     return dates, zdump
 
 
-def sandbox_runs(prepared, work, name, kestrel):
-    """The state on a bare device root, run twice: per run the lines, the
-    var/db tree and what date and zdump report."""
+def bare_device(prepared, work):
+    """A device root in WORK with only the system partition of the prepared
+    test system (hard-linked), for a state to be laid out on."""
     root = os.path.join(work, "device")
     shutil.rmtree(root, ignore_errors=True)
     os.makedirs(os.path.join(root, "usr/share"))
@@ -56,6 +56,13 @@ def sandbox_runs(prepared, work, name, kestrel):
             ["cp", "-al", os.path.join(prepared, entry), os.path.join(root, entry)],
             check=True,
         )
+    return root
+
+
+def sandbox_runs(prepared, work, name, kestrel):
+    """The state on a bare device root, run twice: per run the lines, the
+    var/db tree and what date and zdump report."""
+    root = bare_device(prepared, work)
     states.lay_out(root, name)
     runs = []
     for _ in range(2):
@@ -119,7 +126,7 @@ def run_state(name, prepared, deb, work, log):
                 f"{name}: the device sandbox's run {number} ended with "
                 f"{run['status']} {run['lines']}"
             )
-    wrong, trees = [], []
+    wrong, booted = [], []
     for number, run in enumerate(runs, 1):
         boot_name = f"boot{number}"
         try:
@@ -137,14 +144,14 @@ def run_state(name, prepared, deb, work, log):
         )
         if number == 2:
             expected = dict(expected, warnings=None, files={}, absent=[])
-            if links_and_record(tree) != links_and_record(trees[0]):
+            if links_and_record(tree) != links_and_record(booted[0]):
                 wrong.append(
                     "boot2: the second boot changed the links or " "the record"
                 )
         wrong += [
             f"{boot_name}: {text}" for text in check_boot(got, run, expected, tree)
         ]
-        trees.append(tree)
+        booted.append(tree)
     if wrong:
         log(f"{name}: FAILED\n  " + "\n  ".join(wrong))
         for number in (1, 2):
