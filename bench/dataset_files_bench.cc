@@ -29,8 +29,8 @@ class scratch_dataset {
     std::filesystem::create_directories(path + "/zoneinfo");
     std::filesystem::create_directories(path + "/icutz");
     std::ofstream(path + "/zoneinfo/+VERSION") << "2025b\n";
-    for (const char* name : {"icutz72L.dat", "icutz72.dat", "icutz72l.dat.bak",
-                             "old-icutz72l.dat", "icutz72l.dat"}) {
+    for (const char* name : {"icutz44L.dat", "icutz44.dat", "icutz44l.dat.bak",
+                             "old-icutz44l.dat", "icutz44l.dat"}) {
       std::ofstream(path + "/icutz/" + name) << "data";
     }
   }

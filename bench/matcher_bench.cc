@@ -28,5 +28,5 @@ void match_icu_data_file_name(benchmark::State& state, const char* name) {
 
 BENCHMARK_CAPTURE(match_version_text, full, "2019c.1.0");
 BENCHMARK_CAPTURE(match_version_text, not_a_version, "2019C.1.0");
-BENCHMARK_CAPTURE(match_icu_data_file_name, data_file, "icutz72l.dat");
-BENCHMARK_CAPTURE(match_icu_data_file_name, other_name, "icutz72l.dat.bak");
+BENCHMARK_CAPTURE(match_icu_data_file_name, data_file, "icutz44l.dat");
+BENCHMARK_CAPTURE(match_icu_data_file_name, other_name, "icutz44l.dat.bak");

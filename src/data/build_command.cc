@@ -3,14 +3,13 @@
 #include <sys/stat.h>
 
 #include <cerrno>
-#include <climits>
 #include <cstdio>
 #include <cstdlib>
-#include <fstream>
 #include <stdexcept>
 
 #include "data/child_process.h"
 #include "data/file_tree.h"
+#include "data/icu_part.h"
 #include "data/release_source.h"
 #include "data/usage_error.h"
 #include "data/verify_command.h"
@@ -26,14 +25,6 @@ void make_dir(const std::string& path) {
   }
 }
 
-void write_text(const std::string& path, const std::string& text) {
-  std::ofstream out(path);
-  out << text;
-  if (!out.flush()) {
-    throw std::runtime_error("cannot write " + path);
-  }
-}
-
 void make_zoneinfo(const release_source& source, const std::string& out) {
   const std::string zi = source.make_tzdata_zi();
   make_dir(out);
@@ -44,35 +35,7 @@ void make_zoneinfo(const release_source& source, const std::string& out) {
   for (const char* table : kTables) {
     file_tree::copy_file(source.file(table), out + "/" + table, 0644);
   }
-  write_text(out + "/+VERSION", source.version() + "\n");
-}
-
-// Where the ICU part came from, for whoever looks at the set later.
-constexpr char kOriginNote[] = "origin.txt";
-
-void make_icutz(const release_source& source, const std::string& icu_dir,
-                const std::string& out) {
-  make_dir(out);
-  std::string list;
-  for (const char* resource : kIcuResources) {
-    file_tree::copy_file(icu_dir + "/" + resource, out + "/" + resource, 0644);
-    list += std::string(resource) + "\n";
-  }
-  // icupkg reads a list of items from a file whose name ends in .txt.
-  const std::string list_file = source.file("kestrel-icu-items.txt");
-  write_text(list_file, list);
-  const std::string data_file = out + "/icutz" + kIcuSchema + ".dat";
-  if (child_process{
-          {"icupkg", "-tl", "-a", list_file, "-s", out, "new", data_file}}
-              .run() != 0 ||
-      chmod(data_file.c_str(), 0644) != 0) {
-    throw std::runtime_error("icupkg could not package the ICU resources");
-  }
-  char from[PATH_MAX];
-  const bool resolved = realpath(icu_dir.c_str(), from) != nullptr;
-  write_text(out + "/" + kOriginNote,
-             "ICU resources as published by ICU, copied from " +
-                 (resolved ? std::string(from) : icu_dir) + "\n");
+  file_tree::write_text(out + "/+VERSION", source.version() + "\n");
 }
 
 // The directory that holds path, as a prefix to join names to.
@@ -83,7 +46,7 @@ std::string parent_of(const std::string& path) {
 
 }  // namespace
 
-void build_set(const std::string& release, const std::string& icu_dir,
+void build_set(const std::string& release, const icu_origin& icu,
                const std::string& out_dir) {
   struct stat info {};
   if (lstat(out_dir.c_str(), &info) == 0 || errno != ENOENT) {
@@ -99,7 +62,7 @@ void build_set(const std::string& release, const std::string& icu_dir,
       throw std::runtime_error("cannot open up " + building);
     }
     make_zoneinfo(source, building + "/zoneinfo");
-    make_icutz(source, icu_dir, building + "/icutz");
+    make_icu_part(source, icu, building + "/icutz");
     if (!verify_set(building)) {
       throw std::runtime_error("release " + version +
                                " does not pass verification; nothing built");
@@ -115,23 +78,22 @@ void build_set(const std::string& release, const std::string& icu_dir,
 
 int run_build(const std::vector<std::string>& args) {
   std::vector<std::string> rest;
-  std::string icu_dir;
+  icu_origin icu;
   for (std::size_t i = 0; i < args.size(); ++i) {
     if (args[i] == "--icu" && i + 1 < args.size()) {
-      icu_dir = args[++i];
+      icu.published = args[++i];
+    } else if (args[i] == "--cldr" && i + 1 < args.size()) {
+      icu.cldr = args[++i];
     } else {
       rest.push_back(args[i]);
     }
   }
-  if (rest.size() != 2) {
-    throw usage_error("build [--icu DIR] RELEASE.tar.gz|RELEASE-DIR OUTDIR");
+  // ICU's published resources bring their own CLDR part.
+  if (rest.size() != 2 || (!icu.published.empty() && !icu.cldr.empty())) {
+    throw usage_error(
+        "build [--icu DIR | --cldr DIR] RELEASE.tar.gz|RELEASE-DIR OUTDIR");
   }
-  if (icu_dir.empty()) {
-    throw std::runtime_error(
-        "no ICU resources given: name ICU's published resources for the "
-        "release with --icu DIR");
-  }
-  build_set(rest[0], icu_dir, rest[1]);
+  build_set(rest[0], icu, rest[1]);
   std::printf("built %s\n", rest[1].c_str());
   return EXIT_SUCCESS;
 }

@@ -10,6 +10,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
+#include <fstream>
 #include <memory>
 #include <stdexcept>
 #include <vector>
@@ -77,6 +78,14 @@ void copy_files(const std::string& from, const std::string& to) {
     if (stat(source.c_str(), &info) == 0 && S_ISREG(info.st_mode)) {
       copy_file(source, to + "/" + entry->d_name, 0644);
     }
+  }
+}
+
+void write_text(const std::string& path, const std::string& text) {
+  std::ofstream out(path, std::ios::binary | std::ios::trunc);
+  out << text;
+  if (!out.flush()) {
+    throw std::runtime_error("cannot write " + path);
   }
 }
 

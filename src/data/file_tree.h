@@ -20,6 +20,9 @@ void copy_files(const std::string& from, const std::string& to);
 // Copies one regular file, giving the copy mode.
 void copy_file(const std::string& from, const std::string& to, int mode);
 
+// Writes text as the whole content of the file at path.
+void write_text(const std::string& path, const std::string& text);
+
 // A fresh directory made by mkdtemp(3) from pattern (ending in XXXXXX).
 std::string make_temporary(const std::string& pattern);
 

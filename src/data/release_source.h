@@ -22,6 +22,9 @@ class release_source {
   // with the release's own Makefile, in rearguard form; returns its path.
   std::string make_tzdata_zi() const;
 
+  // The scratch directory holding the release's files.
+  std::string directory() const { return dir; }
+
   // The path of one of the release's files.
   std::string file(const std::string& name) const;
 

@@ -13,9 +13,17 @@
 
 namespace {
 
-// The probe KESTREL_ICU_PROBE names, else the one beside this program when
-// there is one (a build tree), else the installed one.
-std::string probe_path() {
+std::string absolute(const std::string& path) {
+  char resolved[PATH_MAX];
+  if (realpath(path.c_str(), resolved) == nullptr) {
+    throw std::runtime_error("no data set at " + path);
+  }
+  return resolved;
+}
+
+}  // namespace
+
+std::string icu_probe_path() {
   const char* named = std::getenv("KESTREL_ICU_PROBE");
   if (named != nullptr && *named != '\0') {
     return named;
@@ -28,23 +36,13 @@ std::string probe_path() {
   return access(beside.c_str(), X_OK) == 0 ? beside : KESTREL_ICU_PROBE;
 }
 
-std::string absolute(const std::string& path) {
-  char resolved[PATH_MAX];
-  if (realpath(path.c_str(), resolved) == nullptr) {
-    throw std::runtime_error("no data set at " + path);
-  }
-  return resolved;
-}
-
-}  // namespace
-
 bool verify_set(const std::string& set_dir) {
   const std::string set = absolute(set_dir);
   const std::string release = fs::read_first_word(set + "/zoneinfo/+VERSION");
   if (release.empty()) {
     throw std::runtime_error("no zoneinfo/+VERSION in " + set);
   }
-  const std::string probe = probe_path();
+  const std::string probe = icu_probe_path();
   child_process system_ids({probe, "ids"});
   system_ids.environment = {{"ICU_TIMEZONE_FILES_DIR", ""}};
   system_ids.capture = true;

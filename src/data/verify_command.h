@@ -12,6 +12,10 @@
 // when the set passes.
 bool verify_set(const std::string& set_dir);
 
+// The ICU probe: the one KESTREL_ICU_PROBE names, else the one beside this
+// program when there is one (a build tree), else the installed one.
+std::string icu_probe_path();
+
 // kestrel-data verify SETDIR
 int run_verify(const std::vector<std::string>& args);
 

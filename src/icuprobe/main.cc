@@ -10,13 +10,19 @@
 //   kestrel-icu-probe at ZONE SECONDS
 //       ICU's offset and daylight time in ZONE at SECONDS since the epoch,
 //       with ICU's data version: what an ICU program on the device sees.
+//   kestrel-icu-probe data DIR
+//       writes the system ICU's own data package into DIR for icupkg and
+//       prints its path: where a set's CLDR resources come from when none
+//       are given.
 
 #include <cstdio>
 #include <cstdlib>
+#include <exception>
 #include <string>
 
 #include "icuprobe/icu_zone.h"
 #include "icuprobe/probe_check.h"
+#include "icuprobe/system_data.h"
 
 int main(int argc, char** argv) {
   const std::string command = argc > 1 ? argv[1] : "";
@@ -30,9 +36,18 @@ int main(int argc, char** argv) {
   if (command == "at" && argc == 4) {
     return print_offset(argv[2], argv[3]) ? EXIT_SUCCESS : EXIT_FAILURE;
   }
+  if (command == "data" && argc == 3) {
+    try {
+      (void)std::puts(write_system_data(argv[2]).c_str());
+      return EXIT_SUCCESS;
+    } catch (const std::exception& e) {
+      (void)std::fprintf(stderr, "kestrel-icu-probe: %s\n", e.what());
+      return EXIT_FAILURE;
+    }
+  }
   (void)std::fputs(
       "usage: kestrel-icu-probe ids | check RELEASE ZONEINFO | at ZONE "
-      "SECONDS\n",
+      "SECONDS | data DIR\n",
       stderr);
   return 2;
 }

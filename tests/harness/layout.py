@@ -24,7 +24,7 @@ SYSTEM_ZONEINFO = "/usr/share/zoneinfo.default"
 SYSTEM_ICU = "/usr/share/icu"
 
 # The system's ICU schema, as its format file names it, and that file.
-SCHEMA = "72l"
+SCHEMA = "44l"
 ICU_FORMAT_FILE = SYSTEM_ICU + "/icutzformat.txt"
 # Where kestrel points the local-time link when nothing better is known.
 DEFAULT_ZONE = "America/Los_Angeles"
