@@ -12,7 +12,8 @@ import time
 SUITE = "bookworm"
 # systemd boots it; tzdata is the data the system partition is made of;
 # cron and systemd-timesyncd are ordinary services that read the local time
-# and must start after kestrel has finished.
+# and must start after kestrel has finished; libicu72 and libssl3 are what
+# the package's kestrel-data and its ICU probe link.
 PACKAGES = [
     "systemd",
     "systemd-sysv",
@@ -21,6 +22,8 @@ PACKAGES = [
     "tzdata",
     "cron",
     "systemd-timesyncd",
+    "libicu72",
+    "libssl3",
 ]
 
 
