@@ -7,7 +7,7 @@ import os
 import shutil
 import subprocess
 
-from .. import SOURCE, device, layout
+from .. import SOURCE, layout
 from ..states import boot as states
 
 GUEST = os.path.join(SOURCE, "tests", "boot", "guest")
@@ -28,14 +28,27 @@ def install_package(root, deb):
     os.remove(root + inside)
 
 
-def lay_out_system_partition(root):
-    """The system partition made from the image's own tzdata, and the
-    system's local time read through kestrel's links."""
-    device.system_partition(root, os.path.join(root, "usr/share/zoneinfo"))
-    localtime = os.path.join(root, "etc/localtime")
-    if os.path.lexists(localtime):
-        os.remove(localtime)
-    os.symlink(layout.LOCALTIME_LINK, localtime)
+def check_layout(root):
+    """The package laid out the system partition from the image's own tzdata
+    and pointed the system's local time at kestrel's link; the test lays out
+    nothing of it itself."""
+    version = os.path.join(root, layout.rel(layout.SYSTEM_ZONEINFO), "+VERSION")
+    with open(os.path.join(root, layout.rel(layout.ICU_FORMAT_FILE))) as schema:
+        found = schema.read().split()
+    localtime = os.readlink(os.path.join(root, "etc/localtime"))
+    if not os.path.isfile(version) or found != [layout.SCHEMA]:
+        raise RuntimeError(
+            f"the package made no system data set of schema {layout.SCHEMA}"
+        )
+    if localtime != layout.LOCALTIME_LINK:
+        raise RuntimeError(f"/etc/localtime points at {localtime}")
+
+
+def hold_clean_up_agent(root):
+    # Each state's /var/db after a boot is compared with kestrel's run in the
+    # device sandbox alone, so the clean-up agent, which would act on the
+    # marker kestrel leaves, is masked here.
+    run("systemctl", "--root=" + root, "mask", "kestrel-clean.path")
 
 
 def install_collector(root):
@@ -56,7 +69,8 @@ def prepare(base, root, deb):
     shutil.rmtree(root, ignore_errors=True)
     run("cp", "-a", base, root)
     install_package(root, deb)
-    lay_out_system_partition(root)
+    check_layout(root)
+    hold_clean_up_agent(root)
     install_collector(root)
 
 
