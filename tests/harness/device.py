@@ -4,10 +4,24 @@ staged data sets and the links, below a device root."""
 import os
 import shutil
 import subprocess
+import tarfile
 import tempfile
 
-from . import layout
+from . import SOURCE, layout
 
+# The sample device's system partition is this release, compiled here, so
+# that the device and everything the demo stages on it are the same on every
+# machine, whatever tzdata the machine itself has.
+SAMPLE_RELEASE = os.path.join(
+    SOURCE, "tests", "data", "tz-releases", "tzdata2025b.tar.gz"
+)
+RELEASE_SOURCES = (
+    "africa antarctica asia australasia europe northamerica southamerica "
+    "etcetera factory backward"
+).split()
+ZONE_TABLES = ("iso3166.tab", "zone.tab", "zone1970.tab")
+# The old-style local-time link of the sample device points here, where the
+# device has nothing.
 MACHINE_ZONEINFO = "/usr/share/zoneinfo"
 
 
@@ -16,6 +30,25 @@ def release_of(zoneinfo):
     tzdata.zi."""
     with open(os.path.join(zoneinfo, "tzdata.zi")) as zi:
         return zi.readline().split()[-1]
+
+
+def compile_release(tarball, zoneinfo):
+    """zic's tree of a tz release tarball in zoneinfo, with the release's
+    zone tables and +VERSION. Returns the release."""
+    with tempfile.TemporaryDirectory() as source:
+        with tarfile.open(tarball) as release:
+            release.extractall(source)
+        with open(os.path.join(source, "version")) as version:
+            word = version.read().strip()
+        os.makedirs(zoneinfo)
+        subprocess.run(
+            ["zic", "-d", zoneinfo, *RELEASE_SOURCES], cwd=source, check=True
+        )
+        for table in ZONE_TABLES:
+            shutil.copy(os.path.join(source, table), zoneinfo)
+    with open(os.path.join(zoneinfo, "+VERSION"), "w") as version:
+        version.write(word + "\n")
+    return word
 
 
 def write(root, path, text):
@@ -31,14 +64,12 @@ def link(root, path, target):
     os.symlink(target, full)
 
 
-def system_partition(root, source=MACHINE_ZONEINFO):
-    """The system partition: the zone files of source with +VERSION naming
-    their release, and the system's ICU schema. Returns the release."""
-    release = release_of(source)
+def system_partition(root, tarball=SAMPLE_RELEASE):
+    """The system partition: the release compiled, and the system's ICU
+    schema. Returns the release."""
     zoneinfo = os.path.join(root, layout.rel(layout.SYSTEM_ZONEINFO))
     os.makedirs(os.path.dirname(zoneinfo), exist_ok=True)
-    subprocess.run(["cp", "-a", source, zoneinfo], check=True)
-    write(root, layout.SYSTEM_ZONEINFO + "/+VERSION", release + "\n")
+    release = compile_release(tarball, zoneinfo)
     os.makedirs(os.path.join(root, layout.rel(layout.SYSTEM_ICU)), exist_ok=True)
     write(root, layout.ICU_FORMAT_FILE, layout.SCHEMA + "\n")
     return release
@@ -73,16 +104,13 @@ def stage(root, version, word, source=None, zone_source=None):
 
 def sample(root, zone=layout.SAMPLE_ZONE):
     """The sample device (sample/make-device), made anew in root."""
-    if not os.path.isfile(os.path.join(MACHINE_ZONEINFO, "tzdata.zi")):
-        raise SystemExit(
-            f"make-device: no {MACHINE_ZONEINFO}/tzdata.zi (is tzdata installed?)"
-        )
-    if not os.path.isfile(os.path.join(MACHINE_ZONEINFO, zone)):
-        raise SystemExit(f"make-device: no zone {zone} in {MACHINE_ZONEINFO}")
     shutil.rmtree(root, ignore_errors=True)
     os.makedirs(os.path.join(root, layout.rel(layout.STAGED_DIR)))
     release = system_partition(root)
-    update = stage(root, f"{release}.1.1", release, source=MACHINE_ZONEINFO)
+    zoneinfo = os.path.join(root, layout.rel(layout.SYSTEM_ZONEINFO))
+    if not os.path.isfile(os.path.join(zoneinfo, zone)):
+        raise SystemExit(f"make-device: no zone {zone} in release {release}")
+    update = stage(root, f"{release}.1.1", release)
     link(root, layout.ZONEINFO_LINK, layout.SYSTEM_ZONEINFO)
     link(root, layout.LATEST_LINK, update)
     link(root, layout.LOCALTIME_LINK, f"{MACHINE_ZONEINFO}/{zone}")

@@ -1,9 +1,8 @@
-"""Builds the sample device in DEVICE_ROOT (made anew) from this machine's
-compiled time-zone data in /usr/share/zoneinfo, whose release is the version
-line of its tzdata.zi:
+"""Builds the sample device in DEVICE_ROOT (made anew) from the bundled tz
+2025b release (tests/data/tz-releases), compiled with zic:
 
-  usr/share/zoneinfo.default      the system partition's zone files, with
-                                  +VERSION naming the release (say 2025b)
+  usr/share/zoneinfo.default      the system partition's zone files and zone
+                                  tables, with +VERSION naming the release
   usr/share/icu/icutzformat.txt   the system's ICU schema
   var/db/timezone/tz/<release>.1.1
                                   a staged update: a re-release of the same
