@@ -25,9 +25,6 @@ struct set_member {
 // naming the entry.
 class set_image {
  public:
-  // Reads the set in dir, never following a link.
-  static set_image from_directory(const std::string& dir);
-
   void add(set_member member);
 
   // The release of the set's zoneinfo/+VERSION; raises when it has none.
@@ -37,10 +34,6 @@ class set_image {
   std::string schema() const;
   // What the set takes on disk, rounded up to whole blocks of block_size.
   std::uint64_t disk_bytes(std::uint64_t block_size) const;
-
-  // Writes every member below the existing directory dir and makes it all
-  // durable: each file and each directory, dir included, is fsync'ed.
-  void write_into(const std::string& dir) const;
 
   const std::vector<set_member>& members() const { return entries; }
 

@@ -13,6 +13,7 @@
 #include "data/adoption.h"
 #include "data/device_state.h"
 #include "data/file_tree.h"
+#include "data/set_directory.h"
 #include "data/set_source.h"
 #include "data/staging_lock.h"
 #include "data/usage_error.h"
@@ -108,7 +109,7 @@ std::string install_verified(const set_image& image) {
     if (chmod(scratch.c_str(), 0755) != 0) {
       fail("cannot open up " + scratch);
     }
-    image.write_into(scratch);
+    write_set_directory(image, scratch);
     if (!verify_set(scratch)) {
       refuse("the set does not pass verification");
     }

@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "data/set_directory.h"
 #include "data/tar_header.h"
 #include "gtest/gtest.h"
 #include "hand_made_archive.h"
@@ -21,7 +22,7 @@ TEST(set_archive_test, a_packed_set_reads_back_the_same) {
   tree::write_file(dir / "set/zoneinfo/Europe/Paris", std::string(1300, 'x'));
   tree::make_link("../+VERSION", dir / "set/zoneinfo/Europe/V");
   tree::write_file(dir / "set/icutz/icutz44l.dat", "data", 0644);
-  const set_image image = set_image::from_directory(dir / "set");
+  const set_image image = read_set_directory(dir / "set");
   write_set_archive(image, dir / "a.tgz");
   const set_image back = read_set_archive(dir / "a.tgz");
   ASSERT_EQ(back.members().size(), image.members().size());

@@ -1,0 +1,18 @@
+#ifndef KESTREL_DATA_SET_DIRECTORY_H_
+#define KESTREL_DATA_SET_DIRECTORY_H_
+
+#include <string>
+
+#include "data/set_image.h"
+
+// A data set as a directory tree: a set made by build, or a set being
+// staged. Failures raise std::runtime_error naming the path.
+
+// Reads the set in dir, never following a link.
+set_image read_set_directory(const std::string& dir);
+
+// Writes every member of image below the existing directory dir and makes it
+// all durable: each file and each directory, dir included, is fsync'ed.
+void write_set_directory(const set_image& image, const std::string& dir);
+
+#endif  // KESTREL_DATA_SET_DIRECTORY_H_
