@@ -6,6 +6,15 @@
 #include <sstream>
 #include <stdexcept>
 
+namespace {
+
+bool has_bytes(const set_member& member) {
+  return member.type == set_member::kind::file ||
+         member.type == set_member::kind::hard_link;
+}
+
+}  // namespace
+
 std::string sha256_hex(std::string_view bytes) {
   unsigned char digest[EVP_MAX_MD_SIZE];
   unsigned int length = 0;
@@ -25,8 +34,9 @@ std::string sha256_hex(std::string_view bytes) {
 std::string make_manifest(const set_image& image) {
   std::string manifest;
   for (const set_member& member : image.members()) {
-    if (member.type == set_member::kind::file) {
-      manifest += sha256_hex(member.data) + "  " + member.path + "\n";
+    if (has_bytes(member)) {
+      manifest +=
+          sha256_hex(image.bytes_of(member)) + "  " + member.path + "\n";
     }
   }
   return manifest;
@@ -43,14 +53,14 @@ void check_manifest(const set_image& image, const std::string& manifest) {
     }
   }
   for (const set_member& member : image.members()) {
-    if (member.type != set_member::kind::file) {
+    if (!has_bytes(member)) {
       continue;
     }
     const auto sum = listed.find(member.path);
     if (sum == listed.end()) {
       throw std::runtime_error(member.path + " is not in the manifest");
     }
-    if (sum->second != sha256_hex(member.data)) {
+    if (sum->second != sha256_hex(image.bytes_of(member))) {
       throw std::runtime_error(member.path + " does not match its SHA-256 sum");
     }
     listed.erase(sum);

@@ -55,6 +55,8 @@ set_member::kind kind_of(const tar_header& header) {
       return set_member::kind::directory;
     case '2':
       return set_member::kind::link;
+    case '1':
+      return set_member::kind::hard_link;
     case '3':
     case '4':
       throw std::runtime_error("the archive holds a device file: " +
@@ -77,9 +79,10 @@ void write_set_archive(const set_image& image, const std::string& path) {
   }
   write_member(out.get(), kManifestName, '0', 0644, make_manifest(image));
   for (const set_member& member : image.members()) {
-    const char type = member.type == set_member::kind::directory ? '5'
-                      : member.type == set_member::kind::link    ? '2'
-                                                                 : '0';
+    const char type = member.type == set_member::kind::directory   ? '5'
+                      : member.type == set_member::kind::link      ? '2'
+                      : member.type == set_member::kind::hard_link ? '1'
+                                                                   : '0';
     write_member(out.get(), member.path, type, member.mode, member.data);
   }
   const tar_header::block end{};
@@ -120,8 +123,11 @@ set_image read_set_archive(const std::string& path) {
     if (first && path_in_set == kManifestName) {
       manifest = std::move(data);
     } else {
-      image.add({path_in_set, type, header.mode,
-                 type == set_member::kind::link ? header.link_target : data});
+      image.add(
+          {path_in_set, type, header.mode,
+           type == set_member::kind::link || type == set_member::kind::hard_link
+               ? header.link_target
+               : data});
     }
     first = false;
   }

@@ -10,7 +10,9 @@
 #include <cstring>
 #include <fstream>
 #include <iterator>
+#include <map>
 #include <stdexcept>
+#include <utility>
 
 #include "data/file_tree.h"
 
@@ -32,13 +34,25 @@ std::string file_bytes(const char* path) {
   return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
 }
 
-set_member member_of(const FTSENT& entry, std::size_t root_length) {
+// The first name met of each regular file that has several, by inode.
+using first_names = std::map<std::pair<dev_t, ino_t>, std::string>;
+
+set_member member_of(const FTSENT& entry, std::size_t root_length,
+                     first_names& named) {
   set_member member;
   member.path = std::string(entry.fts_path).substr(root_length + 1);
   member.mode = entry.fts_statp->st_mode & 0777;
+  const auto inode =
+      std::make_pair(entry.fts_statp->st_dev, entry.fts_statp->st_ino);
   if (entry.fts_info == FTS_D) {
     member.type = set_member::kind::directory;
+  } else if (entry.fts_info == FTS_F && named.contains(inode)) {
+    member.type = set_member::kind::hard_link;
+    member.data = named.at(inode);
   } else if (entry.fts_info == FTS_F) {
+    if (entry.fts_statp->st_nlink > 1) {
+      named.emplace(inode, member.path);
+    }
     member.data = file_bytes(entry.fts_accpath);
   } else if (entry.fts_info == FTS_SL || entry.fts_info == FTS_SLNONE) {
     member.type = set_member::kind::link;
@@ -91,6 +105,7 @@ set_image read_set_directory(const std::string& dir) {
     fail("cannot read", dir);
   }
   set_image image;
+  first_names named;
   try {
     for (FTSENT* entry = fts_read(walk); entry != nullptr;
          entry = fts_read(walk)) {
@@ -102,7 +117,7 @@ set_image read_set_directory(const std::string& dir) {
         errno = entry->fts_errno;
         fail("cannot read", entry->fts_path);
       }
-      image.add(member_of(*entry, root.size()));
+      image.add(member_of(*entry, root.size(), named));
     }
   } catch (...) {
     (void)fts_close(walk);
@@ -124,6 +139,10 @@ void write_set_directory(const set_image& image, const std::string& dir) {
       directories.push_back(path);
     } else if (member.type == set_member::kind::link) {
       if (symlink(member.data.c_str(), path.c_str()) != 0) {
+        fail("cannot link", path);
+      }
+    } else if (member.type == set_member::kind::hard_link) {
+      if (link((dir + "/" + member.data).c_str(), path.c_str()) != 0) {
         fail("cannot link", path);
       }
     } else {

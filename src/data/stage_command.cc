@@ -45,11 +45,11 @@ void check_space(const set_image& image) {
   const std::uint64_t need = image.disk_bytes(disk.f_frsize);
   const std::uint64_t free_bytes =
       static_cast<std::uint64_t>(disk.f_bavail) * disk.f_frsize;
-  if (need > free_bytes || image.members().size() > disk.f_favail) {
+  if (need > free_bytes || image.inodes() > disk.f_favail) {
     refuse("the set needs " + std::to_string(need) + " bytes and " +
-           std::to_string(image.members().size()) + " inodes, " +
-           paths::kTimezoneDir + " has " + std::to_string(free_bytes) +
-           " bytes and " + std::to_string(disk.f_favail) + " inodes free");
+           std::to_string(image.inodes()) + " inodes, " + paths::kTimezoneDir +
+           " has " + std::to_string(free_bytes) + " bytes and " +
+           std::to_string(disk.f_favail) + " inodes free");
   }
 }
 

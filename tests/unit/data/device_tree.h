@@ -12,6 +12,11 @@ std::map<std::string, std::string> snapshot(const std::string& root);
 // The same with paths relative to root, for comparing two trees.
 std::map<std::string, std::string> relative_snapshot(const std::string& root);
 
+// Every regular file under root, by path relative to root: its link count
+// and the first of its names under root in a walk by name. Two trees whose
+// maps are equal share inodes between the same names.
+std::map<std::string, std::string> shared_inodes(const std::string& root);
+
 // The private device of a test: the system partition's release and ICU
 // schema, and the zoneinfo link at the system partition.
 void make_device(const std::string& system_release,

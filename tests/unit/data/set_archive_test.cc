@@ -1,10 +1,15 @@
 #include "data/set_archive.h"
 
+#include <unistd.h>
+
 #include <functional>
+#include <map>
 #include <stdexcept>
 #include <string>
+#include <utility>
 #include <vector>
 
+#include "data/manifest.h"
 #include "data/set_directory.h"
 #include "data/tar_header.h"
 #include "gtest/gtest.h"
@@ -40,6 +45,59 @@ TEST(set_archive_test, a_hand_made_good_archive_is_read) {
   const scratch_dir dir;
   write_gzip(dir / "a.tgz", tar_bytes(good_members()));
   EXPECT_EQ(read_set_archive(dir / "a.tgz").members().size(), 3U);
+}
+
+TEST(set_archive_test, a_hand_made_hard_link_to_an_earlier_file_is_read) {
+  const scratch_dir dir;
+  auto m = good_members();
+  m.push_back({"zoneinfo/H", '1', "zoneinfo/+VERSION"});
+  m[0].data += sha256_hex(kVersion) + "  zoneinfo/H\n";
+  write_gzip(dir / "a.tgz", tar_bytes(m));
+  const set_image image = read_set_archive(dir / "a.tgz");
+  ASSERT_EQ(image.members().size(), 4U);
+  EXPECT_EQ(image.members()[3].type, set_member::kind::hard_link);
+  EXPECT_EQ(image.bytes_of(image.members()[3]), kVersion);
+}
+
+TEST(set_archive_test, a_packed_set_keeps_its_hard_links) {
+  const scratch_dir dir;
+  tree::write_file(dir / "set/zoneinfo/+VERSION", kVersion);
+  tree::write_file(dir / "set/zoneinfo/Europe/Prague", std::string(1300, 'x'));
+  tree::make_dir(dir / "set/zoneinfo/Etc");
+  ASSERT_EQ(link((dir / "set/zoneinfo/Europe/Prague").c_str(),
+                 (dir / "set/zoneinfo/Europe/Bratislava").c_str()),
+            0);
+  ASSERT_EQ(link((dir / "set/zoneinfo/+VERSION").c_str(),
+                 (dir / "set/zoneinfo/Etc/V").c_str()),
+            0);
+  const set_image image = read_set_directory(dir / "set");
+  write_set_archive(image, dir / "a.tgz");
+  const set_image back = read_set_archive(dir / "a.tgz");
+  // Met first in a walk by name, each file's first name keeps its bytes.
+  const std::map<std::string, std::pair<set_member::kind, std::string>>
+      kExpected = {
+          {"zoneinfo", {set_member::kind::directory, ""}},
+          {"zoneinfo/+VERSION", {set_member::kind::file, kVersion}},
+          {"zoneinfo/Etc", {set_member::kind::directory, ""}},
+          {"zoneinfo/Etc/V",
+           {set_member::kind::hard_link, "zoneinfo/+VERSION"}},
+          {"zoneinfo/Europe", {set_member::kind::directory, ""}},
+          {"zoneinfo/Europe/Bratislava",
+           {set_member::kind::file, std::string(1300, 'x')}},
+          {"zoneinfo/Europe/Prague",
+           {set_member::kind::hard_link, "zoneinfo/Europe/Bratislava"}},
+      };
+  for (const set_image* read : {&image, &back}) {
+    std::map<std::string, std::pair<set_member::kind, std::string>> members;
+    for (const set_member& m : read->members()) {
+      members[m.path] = {m.type, m.data};
+    }
+    EXPECT_EQ(members, kExpected);
+  }
+  // The manifest sums every name, so that sha256sum -c checks them all.
+  EXPECT_NE(make_manifest(image).find(sha256_hex(std::string(1300, 'x')) +
+                                      "  zoneinfo/Europe/Prague\n"),
+            std::string::npos);
 }
 
 TEST(set_archive_test, bad_archives_are_refused_naming_the_fault) {
@@ -113,13 +171,71 @@ TEST(set_archive_test, bad_archives_are_refused_naming_the_fault) {
          return tar_bytes(m);
        },
        "FIFO"},
-      {"hard link",
+      {"hard link to a missing member",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/H", '1', "zoneinfo/none"});
+         return tar_bytes(m);
+       },
+       "the hard link zoneinfo/H to zoneinfo/none names no member before it"},
+      {"hard link to a later member",
+       [] {
+         auto m = good_members();
+         m.insert(m.begin() + 2, {"zoneinfo/H", '1', "zoneinfo/+VERSION"});
+         m[0].data += sha256_hex(kVersion) + "  zoneinfo/H\n";
+         return tar_bytes(m);
+       },
+       "names no member before it"},
+      {"hard link to a directory",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/H", '1', "zoneinfo"});
+         return tar_bytes(m);
+       },
+       "the hard link zoneinfo/H to zoneinfo names no regular file"},
+      {"hard link to a symbolic link",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/H", '1', "zoneinfo/V"});
+         return tar_bytes(m);
+       },
+       "names no regular file"},
+      {"hard link climbing out",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/H", '1', "zoneinfo/../../etc/passwd"});
+         return tar_bytes(m);
+       },
+       "leaves the data set"},
+      {"hard link to an absolute path",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/H", '1', "/etc/passwd"});
+         return tar_bytes(m);
+       },
+       "the hard link zoneinfo/H to /etc/passwd leaves the data set"},
+      {"hard link to the manifest",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/H", '1', kManifestName});
+         return tar_bytes(m);
+       },
+       "names no member before it"},
+      {"hard link with a wrong sum",
+       [] {
+         auto m = good_members();
+         m.push_back({"zoneinfo/H", '1', "zoneinfo/+VERSION"});
+         m[0].data += sha256_hex("2026b\n") + "  zoneinfo/H\n";
+         return tar_bytes(m);
+       },
+       "zoneinfo/H does not match its SHA-256 sum"},
+      {"hard link missing from the manifest",
        [] {
          auto m = good_members();
          m.push_back({"zoneinfo/H", '1', "zoneinfo/+VERSION"});
          return tar_bytes(m);
        },
-       "neither a directory"},
+       "zoneinfo/H is not in the manifest"},
       {"bad checksum",
        [&] {
          std::string b = good;

@@ -11,6 +11,7 @@
 
 #include "clean_device.h"
 #include "data/child_process.h"
+#include "data/manifest.h"
 #include "data/set_archive.h"
 #include "data/set_source.h"
 #include "device_tree.h"
@@ -87,6 +88,50 @@ TEST_F(stage_test, stages_a_packed_archive) {
   write_set_archive(load_set(kSet), dir / "set.tgz");
   EXPECT_EQ(stage_set(load_set(dir / "set.tgz")), kStaged1);
   EXPECT_EQ(relative_snapshot(kStaged1), relative_snapshot(kSet));
+}
+
+// zic writes a zone's links as hard links; a staged set keeps them, whether
+// it comes as the directory build made or as an archive.
+TEST_F(stage_test, keeps_the_hard_links_of_the_set) {
+  const auto source = shared_inodes(kSet);
+  ASSERT_EQ(source.at("/zoneinfo/Europe/Bratislava"),
+            source.at("/zoneinfo/Europe/Prague"));
+  const struct {
+    const char* name;
+    std::function<std::string(const scratch_dir&)> source;
+  } kSources[] = {
+      {"directory", [](const scratch_dir& /*dir*/) { return kSet; }},
+      {"archive",
+       [](const scratch_dir& dir) {
+         write_set_archive(load_set(kSet), dir / "set.tgz");
+         return dir / "set.tgz";
+       }},
+  };
+  for (const auto& from : kSources) {
+    SCOPED_TRACE(from.name);
+    (void)umount2("/var/db/timezone", MNT_DETACH);
+    clean_device::SetUp();
+    make_device("2025b");
+    const scratch_dir dir;
+    EXPECT_EQ(stage_set(load_set(from.source(dir))), kStaged1);
+    EXPECT_EQ(shared_inodes(kStaged1), source);
+  }
+}
+
+// Room for the set's files counted once, not for a copy of each name.
+TEST_F(stage_test, needs_room_for_each_file_once) {
+  const set_image image = load_set(kSet);
+  const std::uint64_t once = image.disk_bytes(4096);
+  std::uint64_t every_name = 0;
+  for (const set_member& member : image.members()) {
+    every_name += (image.bytes_of(member).size() + 4095) / 4096 * 4096;
+  }
+  ASSERT_GT(every_name, once + (256U << 10U));
+  const std::string size = "size=" + std::to_string(once + (128U << 10U));
+  ASSERT_EQ(mount("small", "/var/db/timezone", "tmpfs", 0, size.c_str()), 0);
+  make_device("2025b");
+  EXPECT_EQ(stage_set(image), kStaged1);
+  EXPECT_EQ(shared_inodes(kStaged1), shared_inodes(kSet));
 }
 
 // Each refusal: how the device is made, what is staged, what the message
@@ -191,6 +236,42 @@ const refusal kRefusals[] = {
        return hand_made(dir, m);
      },
      "device file"},
+    {"hard link to a missing file", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       auto m = good_members();
+       m.push_back({"zoneinfo/H", '1', "zoneinfo/none"});
+       return hand_made(dir, m);
+     },
+     "names no member before it"},
+    {"hard link to a later file", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       auto m = good_members();
+       m.insert(m.begin() + 2, {"zoneinfo/H", '1', "zoneinfo/+VERSION"});
+       return hand_made(dir, m);
+     },
+     "names no member before it"},
+    {"hard link to a directory", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       auto m = good_members();
+       m.push_back({"zoneinfo/H", '1', "zoneinfo"});
+       return hand_made(dir, m);
+     },
+     "names no regular file"},
+    {"hard link out of the set", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       auto m = good_members();
+       m.push_back({"zoneinfo/H", '1', "/etc/passwd"});
+       return hand_made(dir, m);
+     },
+     "leaves the data set"},
+    {"hard link with a wrong sum", [] { make_device("2025b"); },
+     [](const scratch_dir& dir) {
+       auto m = good_members();
+       m.push_back({"zoneinfo/H", '1', "zoneinfo/+VERSION"});
+       m[0].data += sha256_hex("2026b\n") + "  zoneinfo/H\n";
+       return hand_made(dir, m);
+     },
+     "zoneinfo/H does not match its SHA-256 sum"},
     {"FIFO", [] { make_device("2025b"); },
      [](const scratch_dir& dir) {
        auto m = good_members();
