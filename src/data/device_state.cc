@@ -6,6 +6,8 @@
 #include <iterator>
 
 #include "data/file_tree.h"
+#include "data/muted_warnings.h"
+#include "data/set_fault.h"
 #include "dataset/icu_data_file.h"
 #include "dataset/kal_dataset.h"
 #include "driver/current_data.h"
@@ -18,6 +20,18 @@ namespace {
 std::string file_text(const char* path) {
   std::ifstream in(path, std::ios::binary);
   return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+}
+
+// A broken set is not adoptable for its fault, whatever else kestrel would
+// have against it; kestrel still adopts one whose fault it never looks at.
+verdict with_fault(verdict adoption, const std::string& fault) {
+  if (fault.empty()) {
+    return adoption;
+  }
+  if (adoption.yes) {
+    return {true, adoption.reason + "; broken: " + fault};
+  }
+  return {false, "not adoptable: " + fault};
 }
 
 }  // namespace
@@ -42,6 +56,7 @@ std::vector<std::string> staged_set_names() {
 }
 
 device_state device_state::read() {
+  const muted_warnings quiet;
   device_state state;
   state.system_version = kal_dataset().get_version_string();
   state.system_schema =
@@ -62,10 +77,13 @@ device_state device_state::read() {
   }
   for (const std::string& name : staged_set_names()) {
     const std::string path = paths::kStagedDir + name;
+    const std::string fault = set_fault(path);
     state.staged.push_back(
-        {path, name, schema_of_set(path),
-         path == state.latest ? kestrel_would_adopt(path)
-                              : verdict{false, "tz_latest names another set"}});
+        {path, name, schema_of_set(path), fault,
+         with_fault(path == state.latest
+                        ? kestrel_would_adopt(path)
+                        : verdict{false, "tz_latest names another set"},
+                    fault)});
   }
   state.cleanup_marker = access(paths::kNeedsCleanup, F_OK) == 0;
   state.version_record = file_text(paths::kVersionRecord);

@@ -11,11 +11,14 @@ struct staged_set {
   std::string path;
   std::string version;
   std::string schema;
+  // What is wrong with the set; empty when nothing is.
+  std::string fault;
   verdict adoption;
 };
 
 // What status reports of the device's time-zone data, read without changing
-// anything.
+// anything and without a line on standard error: what kestrel's own reading
+// would warn about is in the state instead.
 struct device_state {
   static device_state read();
 

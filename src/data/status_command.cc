@@ -37,6 +37,7 @@ std::string as_json(const device_state& s) {
         std::string(i == 0 ? "" : ",") + "{\"path\":" + json_string(set.path) +
         ",\"version\":" + json_string(set.version) +
         ",\"icu_schema\":" + json_string(set.schema) +
+        ",\"fault\":" + json_string(set.fault) +
         ",\"adopted_at_next_start\":" + (set.adoption.yes ? "true" : "false") +
         ",\"reason\":" + json_string(set.adoption.reason) + "}";
   }

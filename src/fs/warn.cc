@@ -9,6 +9,8 @@
 
 namespace {
 
+warn_sink current_sink = nullptr;
+
 // The line is put together in memory and written at once, so that it is
 // never interleaved with anything else on standard error.
 void write_line(std::string_view message, std::string_view error_text) {
@@ -27,7 +29,11 @@ void write_line(std::string_view message, std::string_view error_text) {
     end = static_cast<char*>(std::memcpy(end, part.data(), part.size())) +
           part.size();
   }
-  (void)std::fwrite(line, 1, length, stderr);
+  if (current_sink == nullptr) {
+    (void)std::fwrite(line, 1, length, stderr);
+  } else {
+    current_sink({line, length});
+  }
   std::free(line);
 }
 
@@ -46,4 +52,10 @@ void warn(const char* format, ...) {
     std::free(message);
   }
   errno = saved_errno;
+}
+
+warn_sink set_warn_sink(warn_sink sink) {
+  const warn_sink before = current_sink;
+  current_sink = sink;
+  return before;
 }

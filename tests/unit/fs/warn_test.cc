@@ -1,6 +1,8 @@
 #include "fs/warn.h"
 
 #include <cerrno>
+#include <string>
+#include <string_view>
 
 #include "captured_stderr.h"
 #include "gtest/gtest.h"
@@ -35,4 +37,25 @@ TEST(warn, prints_an_empty_argument_as_nothing) {
   warn("Bad zoneinfo link %s", "");
   EXPECT_EQ(err.text(),
             "kestrel: Bad zoneinfo link : No such file or directory\n");
+}
+
+namespace {
+
+std::string sunk;
+
+void keep(std::string_view line) { sunk += line; }
+
+}  // namespace
+
+TEST(warn, a_sink_takes_the_lines_in_place_of_standard_error) {
+  captured_stderr err;
+  sunk.clear();
+  EXPECT_EQ(set_warn_sink(keep), nullptr);
+  errno = ENOENT;
+  warn("Bad zoneinfo link %s", "/x");
+  EXPECT_EQ(errno, ENOENT);
+  EXPECT_EQ(set_warn_sink(nullptr), keep);
+  warn("after");
+  EXPECT_EQ(sunk, "kestrel: Bad zoneinfo link /x: No such file or directory\n");
+  EXPECT_EQ(err.text(), "kestrel: after: No such file or directory\n");
 }
