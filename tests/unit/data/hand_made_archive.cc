@@ -39,3 +39,9 @@ std::vector<raw_member> good_members(const std::string& release) {
           {"zoneinfo/+VERSION", '0', version},
           {"zoneinfo/V", '2', "+VERSION"}};
 }
+
+std::vector<raw_member> good_members_and(const raw_member& extra) {
+  std::vector<raw_member> members = good_members();
+  members.push_back(extra);
+  return members;
+}

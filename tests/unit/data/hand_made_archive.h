@@ -22,4 +22,7 @@ void write_gzip(const std::string& path, const std::string& bytes);
 // release and a link.
 std::vector<raw_member> good_members(const std::string& release = "2026a");
 
+// The good members with one more after them.
+std::vector<raw_member> good_members_and(const raw_member& extra);
+
 #endif  // KESTREL_TESTS_UNIT_DATA_HAND_MADE_ARCHIVE_H_

@@ -124,58 +124,43 @@ TEST(set_archive_test, bad_archives_are_refused_naming_the_fault) {
        "no manifest"},
       {"dot-dot path",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/../../etc", '5', ""});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"zoneinfo/../../etc", '5', ""}));
        },
        "leaves the data set"},
       {"absolute path",
        [] {
-         auto m = good_members();
-         m.push_back({"/etc/x", '5', ""});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"/etc/x", '5', ""}));
        },
        "leaves the data set"},
       {"absolute link",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/L", '2', "/etc/passwd"});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"zoneinfo/L", '2', "/etc/passwd"}));
        },
        "leaves the data set"},
       {"link climbing out",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/L", '2', "../../x"});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"zoneinfo/L", '2', "../../x"}));
        },
        "leaves the data set"},
       {"character device",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/null", '3', ""});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"zoneinfo/null", '3', ""}));
        },
        "device file"},
       {"block device",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/sda", '4', ""});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"zoneinfo/sda", '4', ""}));
        },
        "device file"},
       {"FIFO",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/fifo", '6', ""});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"zoneinfo/fifo", '6', ""}));
        },
        "FIFO"},
       {"hard link to a missing member",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/H", '1', "zoneinfo/none"});
-         return tar_bytes(m);
+         return tar_bytes(
+             good_members_and({"zoneinfo/H", '1', "zoneinfo/none"}));
        },
        "the hard link zoneinfo/H to zoneinfo/none names no member before it"},
       {"hard link to a later member",
@@ -188,37 +173,28 @@ TEST(set_archive_test, bad_archives_are_refused_naming_the_fault) {
        "names no member before it"},
       {"hard link to a directory",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/H", '1', "zoneinfo"});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"zoneinfo/H", '1', "zoneinfo"}));
        },
        "the hard link zoneinfo/H to zoneinfo names no regular file"},
       {"hard link to a symbolic link",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/H", '1', "zoneinfo/V"});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"zoneinfo/H", '1', "zoneinfo/V"}));
        },
        "names no regular file"},
       {"hard link climbing out",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/H", '1', "zoneinfo/../../etc/passwd"});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and(
+             {"zoneinfo/H", '1', "zoneinfo/../../etc/passwd"}));
        },
        "leaves the data set"},
       {"hard link to an absolute path",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/H", '1', "/etc/passwd"});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"zoneinfo/H", '1', "/etc/passwd"}));
        },
        "the hard link zoneinfo/H to /etc/passwd leaves the data set"},
       {"hard link to the manifest",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/H", '1', kManifestName});
-         return tar_bytes(m);
+         return tar_bytes(good_members_and({"zoneinfo/H", '1', kManifestName}));
        },
        "names no member before it"},
       {"hard link with a wrong sum",
@@ -231,9 +207,8 @@ TEST(set_archive_test, bad_archives_are_refused_naming_the_fault) {
        "zoneinfo/H does not match its SHA-256 sum"},
       {"hard link missing from the manifest",
        [] {
-         auto m = good_members();
-         m.push_back({"zoneinfo/H", '1', "zoneinfo/+VERSION"});
-         return tar_bytes(m);
+         return tar_bytes(
+             good_members_and({"zoneinfo/H", '1', "zoneinfo/+VERSION"}));
        },
        "zoneinfo/H is not in the manifest"},
       {"bad checksum",

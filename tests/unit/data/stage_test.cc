@@ -151,6 +151,15 @@ std::string hand_made(const scratch_dir& dir,
   return dir / "bad.tgz";
 }
 
+// A hand-made archive of the good members and one more.
+std::function<std::string(const scratch_dir&)> adding(raw_member extra) {
+  return [extra](const scratch_dir& dir) {
+    return hand_made(dir, good_members_and(extra));
+  };
+}
+
+void on_2025b() { make_device("2025b"); }
+
 int held_lock = -1;
 
 const refusal kRefusals[] = {
@@ -200,7 +209,7 @@ const refusal kRefusals[] = {
        return dir / "set";
      },
      "does not pass verification"},
-    {"truncated archive", [] { make_device("2025b"); },
+    {"truncated archive", on_2025b,
      [](const scratch_dir& dir) {
        write_set_archive(load_set(kSet), dir / "whole.tgz");
        const std::string whole = tree::file_content(dir / "whole.tgz");
@@ -208,63 +217,33 @@ const refusal kRefusals[] = {
        return dir / "cut.tgz";
      },
      "truncated or corrupt"},
-    {"wrong sums", [] { make_device("2025b"); },
+    {"wrong sums", on_2025b,
      [](const scratch_dir& dir) {
        auto m = good_members();
        m[2].data = "2026b\n";
        return hand_made(dir, m);
      },
      "does not match its SHA-256 sum"},
-    {"path with ..", [] { make_device("2025b"); },
-     [](const scratch_dir& dir) {
-       auto m = good_members();
-       m.push_back({"zoneinfo/../../../etc/x", '5', ""});
-       return hand_made(dir, m);
-     },
+    {"path with ..", on_2025b, adding({"zoneinfo/../../../etc/x", '5', ""}),
      "leaves the data set"},
-    {"absolute link", [] { make_device("2025b"); },
-     [](const scratch_dir& dir) {
-       auto m = good_members();
-       m.push_back({"zoneinfo/L", '2', "/etc/passwd"});
-       return hand_made(dir, m);
-     },
+    {"absolute link", on_2025b, adding({"zoneinfo/L", '2', "/etc/passwd"}),
      "leaves the data set"},
-    {"device file", [] { make_device("2025b"); },
-     [](const scratch_dir& dir) {
-       auto m = good_members();
-       m.push_back({"zoneinfo/null", '3', ""});
-       return hand_made(dir, m);
-     },
+    {"device file", on_2025b, adding({"zoneinfo/null", '3', ""}),
      "device file"},
-    {"hard link to a missing file", [] { make_device("2025b"); },
-     [](const scratch_dir& dir) {
-       auto m = good_members();
-       m.push_back({"zoneinfo/H", '1', "zoneinfo/none"});
-       return hand_made(dir, m);
-     },
-     "names no member before it"},
-    {"hard link to a later file", [] { make_device("2025b"); },
+    {"hard link to a missing file", on_2025b,
+     adding({"zoneinfo/H", '1', "zoneinfo/none"}), "names no member before it"},
+    {"hard link to a later file", on_2025b,
      [](const scratch_dir& dir) {
        auto m = good_members();
        m.insert(m.begin() + 2, {"zoneinfo/H", '1', "zoneinfo/+VERSION"});
        return hand_made(dir, m);
      },
      "names no member before it"},
-    {"hard link to a directory", [] { make_device("2025b"); },
-     [](const scratch_dir& dir) {
-       auto m = good_members();
-       m.push_back({"zoneinfo/H", '1', "zoneinfo"});
-       return hand_made(dir, m);
-     },
-     "names no regular file"},
-    {"hard link out of the set", [] { make_device("2025b"); },
-     [](const scratch_dir& dir) {
-       auto m = good_members();
-       m.push_back({"zoneinfo/H", '1', "/etc/passwd"});
-       return hand_made(dir, m);
-     },
-     "leaves the data set"},
-    {"hard link with a wrong sum", [] { make_device("2025b"); },
+    {"hard link to a directory", on_2025b,
+     adding({"zoneinfo/H", '1', "zoneinfo"}), "names no regular file"},
+    {"hard link out of the set", on_2025b,
+     adding({"zoneinfo/H", '1', "/etc/passwd"}), "leaves the data set"},
+    {"hard link with a wrong sum", on_2025b,
      [](const scratch_dir& dir) {
        auto m = good_members();
        m.push_back({"zoneinfo/H", '1', "zoneinfo/+VERSION"});
@@ -272,13 +251,7 @@ const refusal kRefusals[] = {
        return hand_made(dir, m);
      },
      "zoneinfo/H does not match its SHA-256 sum"},
-    {"FIFO", [] { make_device("2025b"); },
-     [](const scratch_dir& dir) {
-       auto m = good_members();
-       m.push_back({"zoneinfo/fifo", '6', ""});
-       return hand_made(dir, m);
-     },
-     "FIFO"},
+    {"FIFO", on_2025b, adding({"zoneinfo/fifo", '6', ""}), "FIFO"},
 };
 
 TEST_F(stage_test, refuses_with_a_clear_message_and_changes_nothing) {
