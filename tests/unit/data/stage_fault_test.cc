@@ -29,8 +29,8 @@ const std::string kSet = KESTREL_TEST_SET_2026A;
 const std::string kData = KESTREL_DATA_BINARY;
 constexpr char kStaged[] = "/var/db/timezone/tz/2026a.1.1";
 constexpr char kChangingCalls[] =
-    "openat,write,fchmod,chmod,fsync,mkdir,rename,symlink,unlink,unlinkat,"
-    "rmdir,flock";
+    "openat,write,fchmod,chmod,fsync,mkdir,rename,symlink,link,linkat,unlink,"
+    "unlinkat,rmdir,flock";
 
 // A device that has staged before: its lock file and tz/ are there.
 void fresh_device() {
@@ -134,6 +134,9 @@ TEST_F(stage_fault_test, a_kill_at_any_changing_call_leaves_old_or_new) {
   // The set's files and directories, its rename and tz_latest's.
   EXPECT_GE(counts.at("rename"), 2);
   EXPECT_GE(counts.at("symlink"), 1);
+  // A zone's links that zic made as hard links stay hard links.
+  EXPECT_GT(counts.contains("link") ? counts.at("link") : counts.at("linkat"),
+            100);
   EXPECT_GT(counts.at("fsync"), 100);
   int killed_before_done = 0;
   int killed_after_done = 0;
