@@ -1,5 +1,6 @@
 #include "data/adoption.h"
 
+#include "data/muted_warnings.h"
 #include "dataset/kal_dataset.h"
 #include "dataset/kal_version.h"
 #include "driver/current_data.h"
@@ -47,6 +48,7 @@ verdict kestrel_would_adopt(const std::string& set_path) {
 }
 
 verdict may_stage(const std::string& release, const std::string& schema) {
+  const muted_warnings quiet;
   const std::string system_schema =
       fs::read_first_word(std::string(paths::kSystemIcu) + "/icutzformat.txt");
   if (schema != system_schema) {

@@ -82,6 +82,19 @@ TEST_F(stage_test, removes_the_scratch_an_earlier_staging_left) {
   EXPECT_FALSE(tree::present("/var/db/timezone/tz/.stage-AbC123"));
 }
 
+// Staging reads the designated set as kestrel would, but a broken one is
+// not reported in kestrel's words: the staging command has its own.
+TEST_F(stage_test, writes_no_kestrel_lines_over_a_broken_designated_set) {
+  make_device("2025b");
+  tree::make_dir("/var/db/timezone/tz/2025c.1.1/zoneinfo");
+  ASSERT_EQ(::unlink("/var/db/timezone/zoneinfo"), 0);
+  tree::make_link("/var/db/timezone/tz/2025c.1.1/zoneinfo",
+                  "/var/db/timezone/zoneinfo");
+  testing::internal::CaptureStderr();
+  EXPECT_EQ(stage_set(load_set(kSet)), kStaged1);
+  EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+}
+
 TEST_F(stage_test, stages_a_packed_archive) {
   make_device("2025b");
   const scratch_dir dir;
