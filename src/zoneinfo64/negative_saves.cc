@@ -94,6 +94,16 @@ std::string swapped(std::string_view format) {
          std::string(format.substr(0, slash));
 }
 
+// The abbreviation a format gives with no saving and the rule letters.
+std::string standard_name(const std::string& format,
+                          const std::string& letters) {
+  const size_t slash = format.find('/');
+  if (slash != std::string::npos) return format.substr(0, slash);
+  const size_t s = format.find("%s");
+  if (s == std::string::npos) return format;
+  return format.substr(0, s) + letters + format.substr(s + 2);
+}
+
 // A zone line and where it starts, with its text.
 struct zone_line {
   const tz_era& era;
@@ -164,7 +174,19 @@ std::string fold_rules_line(const tz_source& source, const zic_lines& lines,
   raised[line.era.rules].insert(-low);
   std::string out;
   if (!running) {
-    out += line.text(line.stdoff(), line.rules(), line.format(),
+    // Before the rules' first transition the line has no saving, and zic
+    // finds no abbreviation in rules none of which comes within the line:
+    // a fixed line, named as zic names the line's time before its rules,
+    // from the first rule with no saving.
+    const auto zero = std::find_if(first, list.end(), [](const occurrence& o) {
+      return o.rule->save == 0;
+    });
+    std::string letters;
+    if (zero != list.end()) {
+      letters = std::string(lines.fields(zero->rule->line)[9]);
+      if (letters == "-") letters.clear();
+    }
+    out += line.text(line.stdoff(), "-", standard_name(line.format(), letters),
                      until_of(lines, *first, 0));
   }
   out += line.text(hms(line.era.stdoff + low),
