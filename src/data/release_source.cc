@@ -49,8 +49,8 @@ release_source::~release_source() {
 std::string release_source::version() const {
   std::string version = text().version;
   if (!is_release_name(version)) {
-    throw std::runtime_error("the release's version does not name a release: \"" +
-                             version + "\"");
+    throw std::runtime_error(
+        "the release's version does not name a release: \"" + version + "\"");
   }
   return version;
 }

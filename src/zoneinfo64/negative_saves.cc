@@ -47,15 +47,6 @@ std::string moved(std::string_view field, const tz_day_time& when, int delta) {
   return hms(when.seconds + delta) + "s";
 }
 
-std::string join(const std::vector<std::string_view>& fields, size_t from) {
-  std::string text;
-  for (size_t i = from; i < fields.size(); ++i) {
-    text += (i == from ? "" : " ") + std::string(fields[i]);
-  }
-  return text;
-}
-
-
 // The date of a rule's transition as a zone line's UNTIL.
 std::string until_of(const zic_lines& lines, const occurrence& o, int delta) {
   const auto f = lines.fields(o.rule->line);
@@ -124,15 +115,13 @@ struct zone_line {
   std::string format() const { return std::string(fields[first + 2]); }
   // Its UNTIL, a time on standard time moved by delta seconds.
   std::string until(int delta) const {
-    if (!era.has_until) return "";
-    std::vector<std::string_view> until(fields.begin() + first + 3,
-                                        fields.end());
-    std::string last;
-    if (until.size() == 4) {
-      last = moved(until.back(), era.until, delta);
-      until.back() = last;
+    std::string text;
+    for (size_t i = first + 3; i < fields.size(); ++i) {
+      if (!text.empty()) text += " ";
+      text += i == first + 6 ? moved(fields[i], era.until, delta)
+                             : std::string(fields[i]);
     }
-    return join(until, 0);
+    return text;
   }
 };
 
@@ -154,8 +143,8 @@ std::string fold_rules_line(const tz_source& source, const zic_lines& lines,
   // before a rule set's first transition the line's standard offset is
   // standard time (Ireland 1968-1971, Namibia 1990-1994).
   const bool running = begin != list.begin();
-  const auto first = running ? std::prev(begin)
-                             : std::find_if(begin, list.end(), negative);
+  const auto first =
+      running ? std::prev(begin) : std::find_if(begin, list.end(), negative);
   if (std::find_if(first, list.end(), negative) == list.end()) return "";
   auto after = std::find_if(list.rbegin(), list.rend(), negative).base();
   const bool endless =
@@ -189,11 +178,10 @@ std::string fold_rules_line(const tz_source& source, const zic_lines& lines,
     out += line.text(line.stdoff(), "-", standard_name(line.format(), letters),
                      until_of(lines, *first, 0));
   }
-  out += line.text(hms(line.era.stdoff + low),
-                   line.rules() + "_" + std::to_string(-low),
-                   swapped(line.format()),
-                   after == list.end() ? line.until(low)
-                                       : until_of(lines, *after, low));
+  out += line.text(
+      hms(line.era.stdoff + low), line.rules() + "_" + std::to_string(-low),
+      swapped(line.format()),
+      after == list.end() ? line.until(low) : until_of(lines, *after, low));
   if (after != list.end()) {
     out += line.text(line.stdoff(), line.rules(), line.format(), line.until(0));
   }
@@ -208,11 +196,20 @@ std::string raised_rules(const std::string& name,
   for (const tz_rule& rule : rules) {
     const auto f = lines.fields(rule.line);
     const std::string letters = f[9].empty() ? "-" : std::string(f[9]);
-    out += "Rule\t" + name + "_" + std::to_string(raise) + "\t" +
-           std::string(f[2]) + "\t" + std::string(f[3]) + "\t-\t" +
-           std::string(f[5]) + "\t" + std::string(f[6]) + "\t" +
-           moved(f[7], rule.at, -raise) + "\t" + hms(rule.save + raise) +
-           "\t" + letters + "\n";
+    const std::vector<std::string> words = {"Rule",
+                                            name + "_" + std::to_string(raise),
+                                            std::string(f[2]),
+                                            std::string(f[3]),
+                                            "-",
+                                            std::string(f[5]),
+                                            std::string(f[6]),
+                                            moved(f[7], rule.at, -raise),
+                                            hms(rule.save + raise),
+                                            letters};
+    for (size_t i = 0; i < words.size(); ++i) {
+      out += words[i];
+      out += i + 1 < words.size() ? "\t" : "\n";
+    }
   }
   return out;
 }
@@ -230,9 +227,12 @@ std::string fold_negative_saves(std::string_view text) {
       const int64_t end = era.has_until
                               ? instant(era.until_year, era.until, era.stdoff)
                               : INT64_MAX;
-      zone_line line{era,   lines.fields(era.line),
-                     i == 0 ? 2U : 0U, i == 0 ? "Zone\t" + name : "\t\t",
-                     start, end};
+      zone_line line{era,
+                     lines.fields(era.line),
+                     i == 0 ? 2U : 0U,
+                     i == 0 ? "Zone\t" + name : "\t\t",
+                     start,
+                     end};
       std::string folded;
       if (era.rules.empty() && era.save < 0) {
         folded = line.text(hms(era.stdoff + era.save), "-", line.format(),

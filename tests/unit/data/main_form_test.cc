@@ -73,9 +73,9 @@ TEST(main_form_test, folded_main_form_gives_glibc_the_rearguard_offsets) {
     child_process main_form(awk);
     main_form.capture = true;
     ASSERT_EQ(main_form.run(), 0);
-    tree::write_file(dir / "main/tzdata.zi",
-                     std::string("# version ") + release + "\n" +
-                         main_form.output);
+    tree::write_file(
+        dir / "main/tzdata.zi",
+        std::string("# version ") + release + "\n" + main_form.output);
     tree::write_file(dir / "main/zone.tab", "");
     const release_source folded(dir / "main");
     zic(folded.text().zic_text, dir / "new");
@@ -111,9 +111,10 @@ TEST(main_form_test, folded_main_form_gives_glibc_the_rearguard_offsets) {
       }
     }
     unsetenv("TZ");
-    std::printf("%s: zones %d, instants %d, disagreements %d, daylight flag "
-                "differing %d, in",
-                release, zones, instants, disagreements, dst_differences);
+    std::printf(
+        "%s: zones %d, instants %d, disagreements %d, daylight flag "
+        "differing %d, in",
+        release, zones, instants, disagreements, dst_differences);
     for (const std::string& name : dst_zones) std::printf(" %s", name.c_str());
     std::printf("\n");
     EXPECT_EQ(zones, zone_count);

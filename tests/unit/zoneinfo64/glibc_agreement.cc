@@ -141,8 +141,7 @@ int main(int argc, char** argv) {
               icu.version.c_str(), instants.size(), compared);
   std::printf("names unknown to ICU: %d; total offset disagreements: %d\n",
               unknown, offset_disagreements);
-  std::printf("daylight-time disagreements: %d, in",
-              daylight_disagreements);
+  std::printf("daylight-time disagreements: %d, in", daylight_disagreements);
   for (const std::string& name : daylight_zones)
     std::printf(" %s", name.c_str());
   std::printf("\n");

@@ -100,12 +100,11 @@ TEST(negative_saves, folded_zone_compiles_to_icu_offsets) {
       "Zone X 2:00 - A 2016\n 2:00 N %s\n");
   const tz_source source = parse_tz_source(folded);
   const compiled_zone zone = compile_zone(source, source.zones.at("X"));
-  const std::vector<zone_transition> expected = {
-      {1451599200, {3600, 3600}},
-      {1459641600, {3600, 0}},
-      {1472950800, {3600, 3600}},
-      {1491091200, {3600, 0}},
-      {1504400400, {7200, 0}}};
+  const std::vector<zone_transition> expected = {{1451599200, {3600, 3600}},
+                                                 {1459641600, {3600, 0}},
+                                                 {1472950800, {3600, 3600}},
+                                                 {1491091200, {3600, 0}},
+                                                 {1504400400, {7200, 0}}};
   EXPECT_EQ(zone.initial, (zone_offset{7200, 0}));
   ASSERT_EQ(zone.transitions.size(), expected.size());
   for (size_t i = 0; i < expected.size(); ++i) {
