@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <climits>
 #include <cstdint>
-#include <cstdlib>
 #include <map>
 #include <set>
 #include <stdexcept>
@@ -11,6 +10,7 @@
 
 #include "zoneinfo64/tz_source.h"
 #include "zoneinfo64/zic_lines.h"
+#include "zoneinfo64/zone_line.h"
 
 namespace {
 
@@ -22,36 +22,16 @@ struct occurrence {
   int year;
 };
 
-std::string hms(int seconds) {
-  std::string text = seconds < 0 ? "-" : "";
-  seconds = std::abs(seconds);
-  text += std::to_string(seconds / 3600);
-  const int minutes = seconds / 60 % 60;
-  const int rest = seconds % 60;
-  if (minutes != 0 || rest != 0) {
-    text += (minutes < 10 ? ":0" : ":") + std::to_string(minutes);
-  }
-  if (rest != 0) text += (rest < 10 ? ":0" : ":") + std::to_string(rest);
-  return text;
-}
-
 int64_t instant(int year, const tz_day_time& when, int stdoff) {
   return local_seconds(year, when) -
          (when.clock == tz_clock::universal ? 0 : stdoff);
-}
-
-// A time of day read on standard time moves with the standard offset, by
-// delta seconds; wall clock and UT times stay.
-std::string moved(std::string_view field, const tz_day_time& when, int delta) {
-  if (when.clock != tz_clock::standard || delta == 0) return std::string(field);
-  return hms(when.seconds + delta) + "s";
 }
 
 // The date of a rule's transition as a zone line's UNTIL.
 std::string until_of(const zic_lines& lines, const occurrence& o, int delta) {
   const auto f = lines.fields(o.rule->line);
   return std::to_string(o.year) + " " + std::string(f[5]) + " " +
-         std::string(f[6]) + " " + moved(f[7], o.rule->at, delta);
+         std::string(f[6]) + " " + moved_time(f[7], o.rule->at, delta);
 }
 
 // The transitions of rules under a line, from their first to the line's
@@ -77,53 +57,6 @@ std::vector<occurrence> occurrences(const std::vector<tz_rule>& rules,
                    [](const auto& a, const auto& b) { return a.at < b.at; });
   return list;
 }
-
-std::string swapped(std::string_view format) {
-  const size_t slash = format.find('/');
-  if (slash == std::string_view::npos) return std::string(format);
-  return std::string(format.substr(slash + 1)) + "/" +
-         std::string(format.substr(0, slash));
-}
-
-// The abbreviation a format gives with no saving and the rule letters.
-std::string standard_name(const std::string& format,
-                          const std::string& letters) {
-  const size_t slash = format.find('/');
-  if (slash != std::string::npos) return format.substr(0, slash);
-  const size_t s = format.find("%s");
-  if (s == std::string::npos) return format;
-  return format.substr(0, s) + letters + format.substr(s + 2);
-}
-
-// A zone line and where it starts, with its text.
-struct zone_line {
-  const tz_era& era;
-  std::vector<std::string_view> fields;
-  size_t first;      // the index of STDOFF among the fields
-  std::string lead;  // "Zone NAME" on a zone's first line
-  int64_t start;
-  int64_t end;
-
-  std::string text(const std::string& stdoff, const std::string& rules,
-                   const std::string& format, const std::string& until) {
-    std::string line = lead + "\t" + stdoff + "\t" + rules + "\t" + format;
-    lead = "\t\t";
-    return until.empty() ? line + "\n" : line + "\t" + until + "\n";
-  }
-  std::string stdoff() const { return std::string(fields[first]); }
-  std::string rules() const { return std::string(fields[first + 1]); }
-  std::string format() const { return std::string(fields[first + 2]); }
-  // Its UNTIL, a time on standard time moved by delta seconds.
-  std::string until(int delta) const {
-    std::string text;
-    for (size_t i = first + 3; i < fields.size(); ++i) {
-      if (!text.empty()) text += " ";
-      text += i == first + 6 ? moved(fields[i], era.until, delta)
-                             : std::string(fields[i]);
-    }
-    return text;
-  }
-};
 
 // The lines in place of a line that follows rules with negative savings, or
 // nothing when none falls within it; adds the copy of the rules it follows
@@ -175,12 +108,13 @@ std::string fold_rules_line(const tz_source& source, const zic_lines& lines,
       letters = std::string(lines.fields(zero->rule->line)[9]);
       if (letters == "-") letters.clear();
     }
-    out += line.text(line.stdoff(), "-", standard_name(line.format(), letters),
-                     until_of(lines, *first, 0));
+    out +=
+        line.text(line.stdoff(), "-", standard_format(line.format(), letters),
+                  until_of(lines, *first, 0));
   }
   out += line.text(
-      hms(line.era.stdoff + low), line.rules() + "_" + std::to_string(-low),
-      swapped(line.format()),
+      zic_hms(line.era.stdoff + low), line.rules() + "_" + std::to_string(-low),
+      swapped_format(line.format()),
       after == list.end() ? line.until(low) : until_of(lines, *after, low));
   if (after != list.end()) {
     out += line.text(line.stdoff(), line.rules(), line.format(), line.until(0));
@@ -203,8 +137,8 @@ std::string raised_rules(const std::string& name,
                                             "-",
                                             std::string(f[5]),
                                             std::string(f[6]),
-                                            moved(f[7], rule.at, -raise),
-                                            hms(rule.save + raise),
+                                            moved_time(f[7], rule.at, -raise),
+                                            zic_hms(rule.save + raise),
                                             letters};
     for (size_t i = 0; i < words.size(); ++i) {
       out += words[i];
@@ -235,7 +169,7 @@ std::string fold_negative_saves(std::string_view text) {
                      end};
       std::string folded;
       if (era.rules.empty() && era.save < 0) {
-        folded = line.text(hms(era.stdoff + era.save), "-", line.format(),
+        folded = line.text(zic_hms(era.stdoff + era.save), "-", line.format(),
                            line.until(era.save));
       } else if (!era.rules.empty()) {
         folded = fold_rules_line(source, lines, line, raised);
