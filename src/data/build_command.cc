@@ -1,6 +1,7 @@
 #include "data/build_command.h"
 
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <cerrno>
 #include <cstdio>
@@ -16,7 +17,9 @@
 
 namespace {
 
-// The tables beside the zone files that readers of a zoneinfo tree expect.
+// The tables beside the zone files that readers of a zoneinfo tree expect,
+// those the release has: a distribution's tzdata.zi may come with zone.tab
+// alone, which the release cannot lack (read_release reads it).
 constexpr const char* kTables[] = {"zone.tab", "zone1970.tab", "iso3166.tab"};
 
 void make_dir(const std::string& path) {
@@ -25,15 +28,19 @@ void make_dir(const std::string& path) {
   }
 }
 
+// zic compiles the same text the ICU part is converted from, so both say
+// the same about daylight time.
 void make_zoneinfo(const release_source& source, const std::string& out) {
-  const std::string zi = source.make_tzdata_zi();
   make_dir(out);
+  const std::string zi = out + "/tzdata.zi";
+  file_tree::write_text(zi, source.text().zic_text);
   if (child_process{{"zic", "-d", out, zi}}.run() != 0) {
     throw std::runtime_error("zic could not compile the release");
   }
-  file_tree::copy_file(zi, out + "/tzdata.zi", 0644);
   for (const char* table : kTables) {
-    file_tree::copy_file(source.file(table), out + "/" + table, 0644);
+    if (access(source.file(table).c_str(), F_OK) == 0) {
+      file_tree::copy_file(source.file(table), out + "/" + table, 0644);
+    }
   }
   file_tree::write_text(out + "/+VERSION", source.version() + "\n");
 }

@@ -72,17 +72,6 @@ std::int64_t clock_time(std::string_view& text) {
 
 }  // namespace
 
-std::int64_t days_from_civil(std::int64_t year, int month, int day) {
-  // Howard Hinnant's days_from_civil.
-  year -= month <= 2 ? 1 : 0;
-  const std::int64_t era = (year >= 0 ? year : year - 399) / 400;
-  const std::int64_t yoe = year - era * 400;
-  const std::int64_t doy =
-      (153 * (month + (month > 2 ? -3 : 9)) + 2) / 5 + day - 1;
-  const std::int64_t doe = yoe * 365 + yoe / 4 - yoe / 100 + doy;
-  return era * 146097 + doe - 719468;
-}
-
 posix_tz_rule::posix_tz_rule(std::string_view text) {
   skip_name(text);
   std_west = clock_time(text);

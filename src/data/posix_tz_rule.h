@@ -5,6 +5,8 @@
 #include <string_view>
 #include <vector>
 
+#include "zoneinfo64/tz_date.h"  // days_from_civil
+
 // The rule of a TZif footer, a POSIX TZ string with the extensions of RFC
 // 9636 (hours from -167 to 167 in rule times), such as
 // "CET-1CEST,M3.5.0,M10.5.0/3" or "<+0330>-3:30". Only the instants of its
@@ -39,8 +41,5 @@ class posix_tz_rule {
   boundary start;
   boundary end;
 };
-
-// Days from 1970-01-01 to the given date of the proleptic Gregorian calendar.
-std::int64_t days_from_civil(std::int64_t year, int month, int day);
 
 #endif  // KESTREL_DATA_POSIX_TZ_RULE_H_

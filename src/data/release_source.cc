@@ -8,7 +8,6 @@
 
 #include "data/child_process.h"
 #include "data/file_tree.h"
-#include "fs/first_word.h"
 
 namespace {
 
@@ -48,30 +47,15 @@ release_source::~release_source() {
 }
 
 std::string release_source::version() const {
-  std::string version = fs::read_first_word(file("version"));
+  std::string version = text().version;
   if (!is_release_name(version)) {
     throw std::runtime_error(
-        "the release's version file does not name a "
-        "release: \"" +
-        version + "\"");
+        "the release's version does not name a release: \"" + version + "\"");
   }
   return version;
 }
 
-std::string release_source::make_tzdata_zi() const {
-  // "-o version": the version file is the release's, never to be remade
-  // from a git checkout. Rearguard form is what ICU's resources are made
-  // from; in the main form some zones (Europe/Dublin among them) have
-  // negative daylight saving, which glibc reports as daylight time in
-  // winter where ICU reports standard time.
-  child_process make(
-      {"make", "-s", "-o", "version", "DATAFORM=rearguard", "tzdata.zi"});
-  make.directory = dir;
-  if (make.run() != 0) {
-    throw std::runtime_error("the release's Makefile could not make tzdata.zi");
-  }
-  return file("tzdata.zi");
-}
+release_text release_source::text() const { return read_release(dir); }
 
 std::string release_source::file(const std::string& name) const {
   return dir + "/" + name;

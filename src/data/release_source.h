@@ -3,10 +3,13 @@
 
 #include <string>
 
-// A tz release as IANA publishes it, a tzdataRELEASE.tar.gz or a directory
-// of its files, laid out in a scratch directory of its own so that its
-// Makefile can run there without touching the original. The scratch
-// directory goes with the object.
+#include "zoneinfo64/release_reader.h"
+
+// A tz release, a tzdataRELEASE.tar.gz or a directory of its files as IANA
+// publishes them, or a directory holding only a distribution's tzdata.zi
+// and zone tables (Debian's /usr/share/zoneinfo), laid out in a scratch
+// directory of its own so that nothing is written beside the original. The
+// scratch directory goes with the object.
 class release_source {
  public:
   explicit release_source(const std::string& tarball_or_dir);
@@ -14,13 +17,14 @@ class release_source {
   release_source(const release_source&) = delete;
   release_source& operator=(const release_source&) = delete;
 
-  // The release named by its "version" file, such as 2026a; raises
-  // std::runtime_error when that is missing or not a release name.
+  // The release named by its "version" file or tzdata.zi's "# version"
+  // line, such as 2026a; raises std::runtime_error when there is neither or
+  // it is not a release name.
   std::string version() const;
 
-  // Makes the release's tzdata.zi, the whole release in one zic input file,
-  // with the release's own Makefile, in rearguard form; returns its path.
-  std::string make_tzdata_zi() const;
+  // The whole release as one zic input text with no negative saving, its
+  // zone.tab and version (see read_release).
+  release_text text() const;
 
   // The scratch directory holding the release's files.
   std::string directory() const { return dir; }

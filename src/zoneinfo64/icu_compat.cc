@@ -77,14 +77,3 @@ const std::map<std::string, std::string, std::less<>>& icu_compat_regions() {
   };
   return regions;
 }
-
-const std::vector<icu_moved_transition>& icu_moved_transitions() {
-  // ICU's published data starts China's daylight saving of 1986 (PRC rule,
-  // May 4 2:00 local time) at 03:00 standard time, an hour after zic does;
-  // ICU's programs have given that time since, and equal results keep them
-  // giving it.
-  static const std::vector<icu_moved_transition> moved = {
-      {"Asia/Shanghai", 515523600, 515527200},
-  };
-  return moved;
-}

@@ -12,6 +12,8 @@
 #include <stdexcept>
 #include <vector>
 
+#include "zoneinfo64/negative_saves.h"
+
 extern char** environ;
 
 namespace {
@@ -93,7 +95,7 @@ release_text read_release(const std::string& dir) {
   if (readable(dir + "/ziguard.awk")) {
     release.zic_text = run_ziguard(dir);
   } else if (readable(dir + "/tzdata.zi")) {
-    release.zic_text = read_file(dir + "/tzdata.zi");
+    release.zic_text = fold_negative_saves(read_file(dir + "/tzdata.zi"));
   } else {
     throw std::runtime_error(
         dir + " holds neither ziguard.awk with the data files nor tzdata.zi");
@@ -106,5 +108,9 @@ release_text read_release(const std::string& dir) {
   }
   if (release.version.empty())
     throw std::runtime_error("no release version in " + dir);
+  // The text is the release's tzdata.zi, which names its version first.
+  if (!release.zic_text.starts_with("# version ")) {
+    release.zic_text = "# version " + release.version + "\n" + release.zic_text;
+  }
   return release;
 }

@@ -15,8 +15,9 @@ struct release_text {
 // release's own ziguard.awk with awk over the files its Makefile names, so
 // that no saving is negative. A directory holding only tzdata.zi (the whole
 // release in one file, as distributions install it) gives that file, in
-// main form, with the version from its first line when there is no
-// version file. Throws std::runtime_error naming what is missing or fails.
+// main form, with its negative savings folded away (fold_negative_saves),
+// and the version from its first line when there is no version file.
+// Throws std::runtime_error naming what is missing or fails.
 release_text read_release(const std::string& dir);
 
 #endif  // KESTREL_ZONEINFO64_RELEASE_READER_H_

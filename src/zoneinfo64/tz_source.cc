@@ -11,8 +11,8 @@ constexpr std::array<std::string_view, 3> kLineKinds = {"Rule", "Zone", "Link"};
 constexpr std::array<std::string_view, 3> kRangeWords = {"minimum", "maximum",
                                                          "only"};
 
-// The fields of a line: words separated by white space, "#" to the end of
-// the line a comment, and double quotes keeping white space inside a field.
+}  // namespace
+
 std::vector<std::string_view> split_fields(std::string_view line) {
   std::vector<std::string_view> fields;
   size_t i = 0;
@@ -40,6 +40,8 @@ std::vector<std::string_view> split_fields(std::string_view line) {
   }
   return fields;
 }
+
+namespace {
 
 template <typename T>
 T need(std::optional<T> value, const char* what, std::string_view field) {
@@ -128,13 +130,15 @@ tz_source parse_tz_source(std::string_view text) {
       if (fields.empty()) continue;
       if (open_zone != nullptr) {
         open_zone->push_back(read_era(fields, 0));
+        open_zone->back().line = line_number;
       } else {
         const auto kind = match_word(fields[0], kLineKinds);
         if (!kind)
           throw std::runtime_error("unknown line \"" + std::string(fields[0]) +
                                    "\"");
         if (*kind == 0) {
-          const tz_rule rule = read_rule(fields);
+          tz_rule rule = read_rule(fields);
+          rule.line = line_number;
           source.rules[std::string(fields[1])].push_back(rule);
         } else if (*kind == 1) {
           if (fields.size() < 2)
@@ -144,6 +148,7 @@ tz_source parse_tz_source(std::string_view text) {
             throw std::runtime_error("zone " + zone->first + " defined twice");
           open_zone = &zone->second;
           open_zone->push_back(read_era(fields, 2));
+          open_zone->back().line = line_number;
         } else {
           if (fields.size() != 3)
             throw std::runtime_error("a Link line has 3 fields");

@@ -15,6 +15,7 @@ struct tz_rule {
   bool to_max = false;  // TO is "max": the rule goes on for ever
   tz_day_time at;
   int save = 0;
+  size_t line = 0;  // its line in the text, counting from 1
 };
 
 // One line of a Zone: standard offset STDOFF, either a fixed saving or the
@@ -26,6 +27,7 @@ struct tz_era {
   bool has_until = false;
   int until_year = 0;
   tz_day_time until;
+  size_t line = 0;  // its line in the text, counting from 1
 };
 
 // The Zone, Rule and Link lines of a tz release, in zic's input format
@@ -38,6 +40,11 @@ struct tz_source {
   // its "#= TARGET" comment (backward: Asmera was Asmara's link).
   std::map<std::string, std::string> former_links;
 };
+
+// The fields of a line of zic input: words separated by white space, "#"
+// to the end of the line a comment, and double quotes keeping white space
+// inside a field.
+std::vector<std::string_view> split_fields(std::string_view line);
 
 // Reads zic input text; a line it cannot read throws std::runtime_error
 // naming the line.

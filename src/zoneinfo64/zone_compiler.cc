@@ -20,28 +20,15 @@ const std::vector<tz_rule>& rules_named(const tz_source& source,
   return found->second;
 }
 
-// The raw offset and saving from the instant at (UT) on, under a line of
-// standard offset stdoff following rules with the given saving, the line
-// lasting until the end of last_year. ICU has no negative saving: a
-// negative one (the main form's winter time) is part of the raw offset, and
-// while the line has a negative saving still to come, the times between
-// count as daylight saving above that lower raw offset, as the rearguard
-// form writes them.
-zone_offset split(int stdoff, int save, int64_t at, int last_year,
-                  const std::vector<tz_rule>* rules) {
-  if (save < 0) return {stdoff + save, 0};
-  int lowest = 0;
-  if (rules != nullptr) {
-    const int year = year_of(at);
-    for (const tz_rule& rule : *rules) {
-      const bool to_come =
-          rule.from <= last_year &&
-          (rule.to_max || rule.to > year ||
-           (rule.to == year && local_seconds(year, rule.at) - stdoff > at));
-      if (rule.save < lowest && to_come) lowest = rule.save;
-    }
+// The raw offset and saving under a line of standard offset stdoff with
+// the given saving. ICU has no negative saving: the main form's are folded
+// away before the text gets here (fold_negative_saves).
+zone_offset split(int stdoff, int save) {
+  if (save < 0) {
+    throw std::runtime_error("a negative saving, " + std::to_string(save) +
+                             " s, which ICU cannot hold");
   }
-  return {stdoff + lowest, save - lowest};
+  return {stdoff, save};
 }
 
 // Seconds to subtract from a local time read on the given clock.
@@ -92,7 +79,7 @@ compiled_zone compile_zone(const tz_source& source,
     const int stdoff = era.stdoff;
     if (era.rules.empty()) {
       save = era.save;
-      const zone_offset offset = split(stdoff, save, 0, 0, nullptr);
+      const zone_offset offset = split(stdoff, save);
       if (use_start) {
         list.push_back({start_time, offset});
       } else {
@@ -100,9 +87,14 @@ compiled_zone compile_zone(const tz_source& source,
       }
     } else {
       const std::vector<tz_rule>& rules = rules_named(source, era.rules);
+      // zic reads a line's rule times with the saving of the line's own
+      // rules, none before their first transition: what an earlier line
+      // left does not carry over (China's first daylight saving under the
+      // PRC rules, 1986 May 4 2:00, follows Shanghai's summer of 1949 and
+      // is 18:00 UT).
+      save = 0;
       int first_year = INT_MAX;
       int last_year = INT_MIN;
-      const int era_end = use_until ? era.until_year : INT_MAX;
       for (const tz_rule& rule : rules) {
         first_year = std::min(first_year, rule.from);
         last_year = std::max(last_year, rule.to_max ? rule.from + 1 : rule.to);
@@ -115,9 +107,7 @@ compiled_zone compile_zone(const tz_source& source,
         if (zone.final) last_year = zone.final->year - 1;
       }
       if (!use_start) {
-        zone.initial =
-            split(stdoff, 0, local_seconds(first_year, tz_day_time{}), era_end,
-                  &rules);
+        zone.initial = split(stdoff, 0);
       }
       int start_save = 0;
       std::vector<bool> done(rules.size());
@@ -154,13 +144,11 @@ compiled_zone compile_zone(const tz_source& source,
             start_save = save;
             continue;
           }
-          list.push_back(
-              {change, split(stdoff, save, change, era_end, &rules)});
+          list.push_back({change, split(stdoff, save)});
         }
       }
       if (use_start) {
-        list.push_back({start_time, split(stdoff, start_save, start_time,
-                                          era_end, &rules)});
+        list.push_back({start_time, split(stdoff, start_save)});
       }
     }
     if (use_until) {

@@ -130,12 +130,6 @@ zoneinfo64_data build_zoneinfo64(std::string_view zic_text,
     } catch (const std::runtime_error& error) {
       throw std::runtime_error("zone " + name + ": " + error.what());
     }
-    for (const icu_moved_transition& moved : icu_moved_transitions()) {
-      if (moved.zone != name) continue;
-      for (zone_transition& change : data.zones[i].transitions) {
-        if (change.at == moved.tz_time) change.at = moved.icu_time;
-      }
-    }
     if (const auto& rule = data.zones[i].final) {
       check_name(rule->name, "_-", "rule name");
       const auto [known, added] = data.rules.emplace(rule->name, rule->fields);

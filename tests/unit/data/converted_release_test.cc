@@ -2,7 +2,7 @@
 // release itself, with the CLDR resources of ICU's published files or of
 // the system's ICU: each verifies with no disagreement, every zone name
 // from 1900 to 2100, and its icutz/origin.txt says where each part came
-// from.
+// from. Debian's tzdata.zi (main form, negative savings) is one of them.
 
 #include <cstdio>
 #include <string>
@@ -18,13 +18,15 @@ const std::string kReleases = KESTREL_TEST_RELEASES;
 
 struct converted_case {
   const char* release;
+  const char* source;  // under tests/data/tz-releases
   const char* cldr;  // ICU's resources of this release, or "" for the system's
   const char* cldr_origin;
 };
 
 constexpr converted_case kCases[] = {
-    {"2026c", "", "the system ICU's own data (icudt"},
-    {"2026a", "2026a", "ICU resources copied from "},
+    {"2026c", "tzdata2026c.tar.gz", "", "the system ICU's own data (icudt"},
+    {"2026a", "tzdata2026a.tar.gz", "2026a", "ICU resources copied from "},
+    {"2026f", "../tzdata-debian", "2026a", "ICU resources copied from "},
 };
 
 // The probe's report lines, shown with the test's output.
@@ -41,8 +43,7 @@ TEST(converted_release_test, a_set_with_converted_icu_data_verifies) {
     if (*c.cldr != '\0') {
       argv.insert(argv.end(), {"--cldr", kReleases + "/icu/" + c.cldr + "/le"});
     }
-    argv.insert(argv.end(),
-                {kReleases + "/tzdata" + c.release + ".tar.gz", dir / "set"});
+    argv.insert(argv.end(), {kReleases + "/" + c.source, dir / "set"});
     child_process data(argv);
     data.capture = true;
     ASSERT_EQ(data.run(), 0) << data.output;
