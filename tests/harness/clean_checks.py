@@ -20,6 +20,8 @@ LINKS = tuple(
 
 
 class Clean:
+    KILLS_REACH = FAULTS_REACH = ()
+
     def __init__(self, data, kestrel, scratch):
         self.program = traced.DataCommand(data, ["clean"])
         self.next_run = {}

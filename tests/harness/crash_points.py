@@ -172,7 +172,7 @@ def main():
         problems = check_kills(recorded, points, results)
         titles = [(p.state, f"{p.state}: kill before {p.label}") for p in points]
         judged = [result.judged for result in results]
-        problems += data_runs.report(chosen, titles, judged)
+        problems += data_runs.report(chosen, titles, judged, checks.KILLS_REACH)
         print(f"{time.monotonic() - started:.0f} s")
         for problem in problems:
             print("PROBLEM " + problem)

@@ -25,10 +25,11 @@ def judge_kill(command_checks):
     )
 
 
-def report(chosen, titles, judged):
+def report(chosen, titles, judged, required=()):
     """Prints, per state, how many runs ended in each outcome; returns every
     problem, each after the title of its run (titles and judged go
-    together, one (state, title) and one (outcome, problems) a run)."""
+    together, one (state, title) and one (outcome, problems) a run), and
+    the outcomes of required that a state never reached."""
     problems = []
     for state, _ in chosen:
         outcomes = collections.Counter()
@@ -40,4 +41,9 @@ def report(chosen, titles, judged):
         print(f"{state}: {sum(outcomes.values())} runs")
         for outcome, count in sorted(outcomes.items()):
             print(f"  {count:5}  {outcome}")
+        problems += [
+            f"{state}: no run ends with {outcome}"
+            for outcome in required
+            if outcome not in outcomes
+        ]
     return problems

@@ -191,7 +191,8 @@ def data_main(options, kestrel, chosen, started):
         count = sum(1 for fault in faults if fault.state == state)
         print(f"{state}: {len(recorded[state][2])} file-system calls, {count} runs")
     titles = [(fault.state, fault.describe()) for fault in faults]
-    defects = data_runs.report(chosen, titles, [judged for _, judged in results])
+    judged = [outcome for _, outcome in results]
+    defects = data_runs.report(chosen, titles, judged, checks.FAULTS_REACH)
     for defect in defects:
         print("DEFECT " + defect)
     print(

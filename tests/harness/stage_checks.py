@@ -12,6 +12,11 @@ OUTCOME = layout.DEVICE_LINKS + layout.DEVICE_RECORDS
 
 
 class Stage:
+    # Kills on both sides of the re-pointing of tz_latest, and faults that
+    # the staging refuses with the device as it was, in every state.
+    KILLS_REACH = ("tz_latest old", "tz_latest new")
+    FAULTS_REACH = ("refused, device as it was",)
+
     def __init__(self, data, kestrel, scratch):
         self.kestrel = kestrel
         set_dir = small_set.build(data, scratch)
