@@ -47,9 +47,8 @@ class Clean:
                 counts["renamed"] += 1
             else:
                 counts["gone"] += 1
-        return "removable sets whole {whole}, renamed {renamed}, gone {gone}".format(
-            **counts
-        ), problems
+        label = "removable sets whole {whole}, renamed {renamed}, gone {gone}"
+        return label.format(**counts), problems
 
     def next_run_problems(self, state, expected, tree):
         """The next run's problems, each state's kept by tree."""

@@ -99,4 +99,3 @@ class Stage:
         else:
             label = "staged, failure reported"
         return label, problems + self.next_staging(run.after)
-

@@ -63,7 +63,10 @@ STAGE = [
         SYSTEM + staged("2025c.1.1") + designated("2025c.1.1") + latest("2025c.1.1"),
     ),
     # The release staged once already and not yet adopted: 2026a.1.2.
-    ("second-of-release", SYSTEM + ON_SYSTEM + staged("2026a.1.1") + latest("2026a.1.1")),
+    (
+        "second-of-release",
+        SYSTEM + ON_SYSTEM + staged("2026a.1.1") + latest("2026a.1.1"),
+    ),
     # An earlier staging killed: its scratch directory, its new tz_latest
     # link and the lock file are still there.
     (
@@ -113,5 +116,6 @@ CLEAN = [
 
 def tree(lines):
     return scenario.tree_from((line, "harness.states.data_commands") for line in lines)
+
 
 STATES = {"stage": STAGE, "clean": CLEAN}
