@@ -6,13 +6,15 @@ tz_latest link) and the lines it may print."""
 import hashlib
 import os
 
-from . import layout
+from . import layout, messages
 
 STAGED = layout.STAGED.rstrip("/")
 LATEST = layout.rel(layout.LATEST_LINK)
 LOCK = layout.rel(layout.TIMEZONE_DIR) + ".kestrel-data.lock"
 NEW_LATEST = layout.rel(layout.TIMEZONE_DIR) + ".tz_latest.new"
 # kestrel-data's own lines: "kestrel-data: ..." and "kestrel-data clean: ...".
+# Reading the device's data sets it shares kestrel's code, whose warnings
+# (harness.messages) it prints as kestrel does.
 OWN_LINES = ("kestrel-data: ", "kestrel-data clean: ")
 
 
@@ -64,8 +66,8 @@ def without_leftovers(tree):
 
 
 def ending_problems(run, timeout):
-    """The ways a run may not end: a hang, a death by a signal, a line not
-    kestrel-data's own."""
+    """The ways a run may not end: a hang, a death by a signal, a line that
+    is neither kestrel-data's own nor a warning of kestrel's code."""
     problems = []
     if run.timed_out:
         problems.append(f"no end within {timeout} s")
@@ -73,7 +75,9 @@ def ending_problems(run, timeout):
         signal = run.trace.signal if run.trace is not None else None
         problems.append("killed by " + (signal or run.exit_text()))
     problems += [
-        "foreign line: " + line for line in run.stderr if not line.startswith(OWN_LINES)
+        "foreign line: " + line
+        for line in run.stderr
+        if not line.startswith(OWN_LINES) and not messages.WARNING.fullmatch(line)
     ]
     return problems
 

@@ -29,8 +29,6 @@ problem is a defect.
 """
 
 import concurrent.futures
-import os
-import re
 import signal
 import sys
 import time
@@ -50,18 +48,6 @@ DEFAULT_LINK_FAILED = (
 )
 TERMINATE = "terminate called after throwing an instance of 'int'"
 LOCALTIME_PHASE = ("kestrel: Correcting localtime link to ", DEFAULT_LOCALTIME)
-
-# Every line kestrel writes: "kestrel: MESSAGE: ERRNO-TEXT".
-ERRNO_TEXTS = sorted(
-    {os.strerror(number) for number in range(0, 134)}, key=len, reverse=True
-)
-WARNING = re.compile(
-    "kestrel: (?:"
-    + "|".join(messages.pattern(message) for message in messages.formats())
-    + "): (?:"
-    + "|".join(re.escape(text) for text in ERRNO_TEXTS)
-    + ")"
-)
 
 
 def specified_abort(stderr):
@@ -120,7 +106,7 @@ def judge(fault, run, tree):
     defects += [
         "foreign warning line: " + line
         for line in warnings
-        if not WARNING.fullmatch(line)
+        if not messages.WARNING.fullmatch(line)
     ]
     changed = trees.changed(tree, run.after, layout.STAGED)
     if changed:
