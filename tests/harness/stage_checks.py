@@ -29,12 +29,8 @@ class Stage:
         self.outcomes = {}
         self.next_staging = device.ByTree(self.next_staging_problems)
 
-    def run_on(self, program, tree):
-        """program run on a fresh device built from tree."""
-        return traced.run_fresh(program, tree)
-
     def kestrel_outcome(self, tree):
-        started = self.run_on(self.kestrel, tree)
+        started = traced.run_fresh(self.kestrel, tree)
         return started.exit_text(), traced.outcome(started.after, OUTCOME)
 
     def latest_problems(self, before, tree):
@@ -58,7 +54,7 @@ class Stage:
         return problems
 
     def next_staging_problems(self, tree):
-        again = self.run_on(self.program, tree)
+        again = traced.run_fresh(self.program, tree)
         if again.returncode != 0:
             return [f"the next staging failed: {again.exit_text()} {again.stderr}"]
         label, problems = self.latest_problems({}, again.after)
