@@ -145,13 +145,27 @@ struct removals {
   std::vector<std::string> sets;
 };
 
+[[noreturn]] void unreadable_staged_dir(int error) {
+  throw std::runtime_error(std::string("cannot read ") + paths::kStagedDir +
+                           ": " + std::strerror(error) + "; nothing removed");
+}
+
+// No tz/ is nothing to remove; one that cannot be read is not.
 removals what_to_remove(const std::set<std::string>& kept) {
   removals result;
   DIR* dir = opendir(paths::kStagedDir);
   if (dir == nullptr) {
+    if (errno != ENOENT) {
+      unreadable_staged_dir(errno);
+    }
     return result;
   }
-  while (const dirent* entry = readdir(dir)) {
+  for (;;) {
+    errno = 0;
+    const dirent* entry = readdir(dir);
+    if (entry == nullptr) {
+      break;
+    }
     const std::string name = entry->d_name;
     if (is_leftover(name)) {
       result.leftovers.push_back(name);
@@ -159,7 +173,11 @@ removals what_to_remove(const std::set<std::string>& kept) {
       result.sets.push_back(name);
     }
   }
+  const int error = errno;
   closedir(dir);
+  if (error != 0) {
+    unreadable_staged_dir(error);
+  }
   // In name order, so that what a run says does not depend on the directory.
   std::sort(result.leftovers.begin(), result.leftovers.end());
   std::sort(result.sets.begin(), result.sets.end());

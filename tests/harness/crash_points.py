@@ -1,8 +1,11 @@
 """Kills kestrel just before each system call that changes the file system,
-starts it again, and compares the device with one uninterrupted run.
+starts it again, and compares the device with one uninterrupted run; or
+kills a kestrel-data command there and checks what it left.
 
     python3 -m harness.crash_points --kestrel build/kestrel [--jobs 2]
         [--state NAME]... [--windows FILE]
+    python3 -m harness.crash_points --kestrel build/kestrel
+        --data build/kestrel-data --command stage|clean [--state NAME]...
 
 For every representative device state (harness.states.faults) it records
 kestrel's own system calls, picks those that change the file system, and for
@@ -18,6 +21,11 @@ and on everything, and every window that does not converge with what it
 leaves on the device. With --windows, the windows found must be exactly the
 ones listed in FILE (one "STATE LEVEL kill before ACTION" per line); any
 difference is printed as the lines to add or remove, and fails.
+
+With --data, the same kills land in `kestrel-data stage` (of the small set,
+harness.small_set) or `kestrel-data clean`, over their own states
+(harness.states.data_commands), and what each kill leaves is judged by
+harness.stage_checks or harness.clean_checks; every problem fails.
 """
 
 import collections
@@ -27,7 +35,7 @@ import sys
 import tempfile
 import time
 
-from . import layout, strace, traced
+from . import data_runs, layout, strace, traced
 from . import tree as trees
 
 # Calls whose success always shows in the device tree.
@@ -91,8 +99,8 @@ class Point:
         self.expected = expected
 
 
-def record(state, stem, kestrel):
-    tree, run = traced.record(state, stem, kestrel)
+def record(state, tree, program):
+    run = traced.record(state, tree, program)
     seen = collections.Counter()
     points = []
     for call in run.trace.calls:
@@ -106,18 +114,22 @@ def record(state, stem, kestrel):
 
 
 class Result:
-    def __init__(self, killed, crashed, rerun):
+    """Whether the kill landed, the device it left (as a listing) and what
+    judge made of that device: kestrel's run on it, or a kestrel-data
+    command's outcome and problems."""
+
+    def __init__(self, killed, crashed, judged):
         self.killed = killed
         self.crashed = crashed
-        self.rerun = rerun
+        self.judged = judged
 
 
-def crash(point, kestrel):
+def crash(point, program, judge):
     scratch = tempfile.mkdtemp(prefix="kestrel-crash.")
     try:
         device = traced.build_device(scratch, point.tree)
-        killed = traced.run_kestrel(
-            kestrel, device, strace.injection_options(point.call, "signal=KILL")
+        killed = traced.run(
+            program, device, strace.injection_options(point.call, "signal=KILL")
         )
         # The trace tells the death: util-linux's unshare reports a child
         # killed by SIGKILL as exit status 1, not as that signal.
@@ -127,24 +139,48 @@ def crash(point, kestrel):
             and killed.trace.killed
             and strace.hit(killed.trace, point.call)
         )
-        crashed = trees.listing(trees.read(device))
-        rerun = traced.run_kestrel(kestrel, device)
-        return Result(ok, crashed, rerun)
+        return Result(ok, trees.listing(killed.after), judge(point, device, killed))
     finally:
         shutil.rmtree(scratch, ignore_errors=True)
+
+
+def rerun(kestrel):
+    """kestrel started again on the device a kill left."""
+    return lambda point, device, killed: traced.run(kestrel, device)
+
+
+def kill_everywhere(chosen, program, judge, jobs):
+    """The crash points of every state, and the result of each."""
+    with concurrent.futures.ThreadPoolExecutor(jobs) as pool:
+        recorded = list(
+            pool.map(lambda state: record(state[0], state[1], program), chosen)
+        )
+        points = [point for state_points in recorded for point in state_points]
+        results = list(pool.map(lambda point: crash(point, program, judge), points))
+    return recorded, points, results
 
 
 def main():
     options, kestrel, chosen = traced.command_line(__doc__, ("--windows", {}))
     started = time.monotonic()
+    if options.data:
+        with data_runs.checks(options, kestrel) as checks:
+            judge = data_runs.judge_kill(checks)
+            recorded, points, results = kill_everywhere(
+                chosen, checks.program, judge, options.jobs
+            )
+        problems = check_kills(recorded, points, results)
+        titles = [(p.state, f"{p.state}: kill before {p.label}") for p in points]
+        judged = [result.judged for result in results]
+        problems += data_runs.report(chosen, titles, judged, checks.KILLS_REACH)
+        print(f"{time.monotonic() - started:.0f} s")
+        for problem in problems:
+            print("PROBLEM " + problem)
+        return 1 if problems else 0
 
-    with concurrent.futures.ThreadPoolExecutor(options.jobs) as pool:
-        recorded = list(
-            pool.map(lambda state: record(state[0], state[1], kestrel), chosen)
-        )
-        points = [point for state_points in recorded for point in state_points]
-        results = list(pool.map(lambda point: crash(point, kestrel), points))
-
+    recorded, points, results = kill_everywhere(
+        chosen, kestrel, rerun(kestrel), options.jobs
+    )
     problems = check_kills(recorded, points, results)
     windows = report(chosen, points, results)
     print(f"{time.monotonic() - started:.0f} s")
@@ -201,7 +237,7 @@ def report(chosen, points, results):
             if point.state != state:
                 continue
             counts["points"] += 1
-            got = traced.outcome(result.rerun.after, everything)
+            got = traced.outcome(result.judged.after, everything)
             want = traced.outcome(point.expected, everything)
             if all(got[path] == want[path] for path in links):
                 counts["links"] += 1

@@ -3,6 +3,8 @@ that the device still starts.
 
     python3 -m harness.fault_matrix --kestrel build/kestrel [--jobs 2]
         [--state NAME]... [--costs] [--outcomes FILE]
+    python3 -m harness.fault_matrix --kestrel build/kestrel
+        --data build/kestrel-data --command stage|clean [--state NAME]...
 
 For every representative device state (harness.states.faults) it records
 kestrel's own system calls in the device sandbox, then, for every call that
@@ -18,16 +20,20 @@ Prints the totals and every defect, and exits 1 if there is one.
 --costs lists, per state, the faults after which the device ends otherwise
 than after a run without faults; --outcomes writes every run's outcome to a
 file, so that two builds can be compared run by run.
+
+With --data BINARY --command stage|clean it fails every file-system call of
+that kestrel-data command instead (harness.states.data_commands; stage
+installs the small set of harness.small_set), and harness.stage_checks or
+harness.clean_checks judge each run and the next uninterrupted one; every
+problem is a defect.
 """
 
 import concurrent.futures
-import os
-import re
 import signal
 import sys
 import time
 
-from . import layout, messages, strace, traced
+from . import data_runs, layout, messages, strace, traced
 from . import tree as trees
 
 ERRNOS = ("EACCES", "EIO", "EROFS", "ENOSPC", "ENOMEM", "ELOOP", "ENAMETOOLONG")
@@ -42,18 +48,6 @@ DEFAULT_LINK_FAILED = (
 )
 TERMINATE = "terminate called after throwing an instance of 'int'"
 LOCALTIME_PHASE = ("kestrel: Correcting localtime link to ", DEFAULT_LOCALTIME)
-
-# Every line kestrel writes: "kestrel: MESSAGE: ERRNO-TEXT".
-ERRNO_TEXTS = sorted(
-    {os.strerror(number) for number in range(0, 134)}, key=len, reverse=True
-)
-WARNING = re.compile(
-    "kestrel: (?:"
-    + "|".join(messages.pattern(message) for message in messages.formats())
-    + "): (?:"
-    + "|".join(re.escape(text) for text in ERRNO_TEXTS)
-    + ")"
-)
 
 
 def specified_abort(stderr):
@@ -112,7 +106,7 @@ def judge(fault, run, tree):
     defects += [
         "foreign warning line: " + line
         for line in warnings
-        if not WARNING.fullmatch(line)
+        if not messages.WARNING.fullmatch(line)
     ]
     changed = trees.changed(tree, run.after, layout.STAGED)
     if changed:
@@ -122,28 +116,26 @@ def judge(fault, run, tree):
     return defects
 
 
-def record(state, stem, kestrel):
-    tree, run = traced.record(state, stem, kestrel)
+def record(state, tree, program):
+    run = traced.record(state, tree, program)
     return tree, run, [call for call in run.trace.calls if strace.touches_files(call)]
 
 
-def inject(fault, tree, kestrel):
+def inject(fault, state, program, judge_run):
     options = strace.injection_options(fault.call, "error=" + fault.errno_name)
-    run = traced.run_fresh(kestrel, tree, options)
-    return run, judge(fault, run, tree)
+    run = traced.run_fresh(program, state[0], options)
+    return run, judge_run(fault, run, state)
 
 
-def main():
-    options, kestrel, chosen = traced.command_line(
-        __doc__, ("--costs", {"action": "store_true"}), ("--outcomes", {})
-    )
-    started = time.monotonic()
-
-    with concurrent.futures.ThreadPoolExecutor(options.jobs) as pool:
+def fail_everywhere(chosen, program, judge_run, jobs):
+    """The recording of every state (its tree, its run and its file-system
+    calls), its faults, and each fault's run with what judge_run(fault,
+    run, recorded state) made of it."""
+    with concurrent.futures.ThreadPoolExecutor(jobs) as pool:
         recorded = dict(
             zip(
                 (name for name, _ in chosen),
-                pool.map(lambda state: record(state[0], state[1], kestrel), chosen),
+                pool.map(lambda state: record(state[0], state[1], program), chosen),
             )
         )
         faults = [
@@ -154,10 +146,62 @@ def main():
         ]
         results = list(
             pool.map(
-                lambda fault: inject(fault, recorded[fault.state][0], kestrel),
+                lambda fault: inject(fault, recorded[fault.state], program, judge_run),
                 faults,
             )
         )
+    return recorded, faults, results
+
+
+def data_main(options, kestrel, chosen, started):
+    """The matrix of a kestrel-data command: a defect is a problem that its
+    checks find in a run, or a fault that did not land."""
+    with data_runs.checks(options, kestrel) as checks:
+
+        def judge_run(fault, run, state):
+            before, recorded_run, _ = state
+            outcome, problems = checks.after_fault(
+                fault.state, before, recorded_run.after, run
+            )
+            if not strace.hit(run.trace, fault.call):
+                problems.append("the fault did not land on that call")
+            # Judged: thousands of devices holding a set would not fit in
+            # memory.
+            run.after = run.trace = None
+            return outcome, problems
+
+        recorded, faults, results = fail_everywhere(
+            chosen, checks.program, judge_run, options.jobs
+        )
+    for state, _ in chosen:
+        count = sum(1 for fault in faults if fault.state == state)
+        print(f"{state}: {len(recorded[state][2])} file-system calls, {count} runs")
+    titles = [(fault.state, fault.describe()) for fault in faults]
+    judged = [outcome for _, outcome in results]
+    defects = data_runs.report(chosen, titles, judged, checks.FAULTS_REACH)
+    for defect in defects:
+        print("DEFECT " + defect)
+    print(
+        f"runs {len(faults)}, defects {len(defects)} "
+        f"({time.monotonic() - started:.0f} s)"
+    )
+    return 1 if defects else 0
+
+
+def main():
+    options, kestrel, chosen = traced.command_line(
+        __doc__, ("--costs", {"action": "store_true"}), ("--outcomes", {})
+    )
+    started = time.monotonic()
+    if options.data:
+        return data_main(options, kestrel, chosen, started)
+
+    recorded, faults, results = fail_everywhere(
+        chosen,
+        kestrel,
+        lambda fault, run, state: judge(fault, run, state[0]),
+        options.jobs,
+    )
 
     clean = terminations = 0
     defects = []

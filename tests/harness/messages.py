@@ -33,3 +33,16 @@ def pattern(format_string, text=".*", number="-?[0-9]+"):
         text if part == "%s" else number if part == "%d" else re.escape(part)
         for part in parts
     )
+
+
+# Every line kestrel's code writes: "kestrel: MESSAGE: ERRNO-TEXT".
+ERRNO_TEXTS = sorted(
+    {os.strerror(number) for number in range(0, 134)}, key=len, reverse=True
+)
+WARNING = re.compile(
+    "kestrel: (?:"
+    + "|".join(pattern(message) for message in formats())
+    + "): (?:"
+    + "|".join(re.escape(text) for text in ERRNO_TEXTS)
+    + ")"
+)

@@ -11,6 +11,11 @@ process, and the count survives execve. kestrel's N-th call of a system call
 is therefore invocation N plus the number of chroot's own calls of it. Each
 call keeps both numbers; an injection is checked afterwards in the injected
 run's own trace (hit).
+
+kestrel-data runs with strace as the sandbox's --reader command, so its
+start is the execve of its own path, the first call traced. It is linked
+dynamically: the loader's calls on this machine's shared libraries come
+before its own and are not the device's files.
 """
 
 import os
@@ -22,6 +27,15 @@ STANDARD_STREAM = re.compile(r"^[012]<")
 DESCRIPTOR = re.compile(r"\b\d+<(/[^>]*)>")
 QUOTED = re.compile(r'"((?:[^"\\]|\\.)*)"')
 SUBJECT = re.compile(r'"(?:[^"\\]|\\.)*"|\b\d+<[^>]*>')
+KILLED = re.compile(r"^\+\+\+ killed by (SIG\w+)")
+# kestrel-data's scratch directories, named by mkdtemp afresh in every run,
+# read as one name so that the calls of two runs compare.
+SCRATCH = re.compile(r"(/\.stage-)[A-Za-z0-9]{6}\b")
+# The program the sandbox changes root to, which kestrel becomes.
+KESTREL_START = "/.kestrel"
+# What the dynamic loader reads and maps: its cache and the machine's
+# libraries, as the subject of a call.
+LIBRARIES = re.compile(r'^(?:"|\d+<)(?:/etc/ld\.so\.|/(?:usr/)?lib(?:64)?/)')
 
 # The calls that change the file system whatever their arguments, each with
 # the positions, among its quoted file names, of the names it changes (none
@@ -69,6 +83,12 @@ CHANGING = {
     "pwritev2": [],
     "copy_file_range": [],
     "sendfile": [],
+    # What was written reaches the disk: a kill on either side of it ends
+    # the run with the same files, but the device's durable state differs.
+    "fsync": [],
+    "fdatasync": [],
+    "syncfs": [],
+    "sync_file_range": [],
 }
 # Open calls change the file system when they create or truncate.
 OPENING = {"open", "openat", "openat2"}
@@ -110,34 +130,41 @@ class Call:
 
 
 class Trace:
-    """kestrel's calls from its start (the execve of /.kestrel, kept as
-    start), and whether strace saw it killed by SIGKILL."""
+    """The program's calls from its start (its execve, kept as start), and
+    the signal strace saw kill it (None when none did)."""
 
-    def __init__(self, start, calls, killed):
+    def __init__(self, start, calls, signal):
         self.start = start
         self.calls = calls
-        self.killed = killed
+        self.signal = signal
+
+    @property
+    def killed(self):
+        return self.signal == "SIGKILL"
 
 
-def parse(lines, device=None):
-    """The trace of the changed-root command, its descriptors' paths (-y)
-    given below the device root when device is the root's real path."""
+def parse(lines, device=None, program=KESTREL_START):
+    """The trace of the program started by the execve of the path program,
+    its descriptors' paths (-y) given below the device root when device is
+    the root's real path."""
     seen = {}
     calls = []
     start = None
-    killed = False
+    signal = None
     for line in lines:
         line = line.rstrip("\n")
         if device:
             line = line.replace(device + "/", "/").replace(device, "/")
-        if line.startswith("+++ killed by SIGKILL"):
-            killed = True
+        line = SCRATCH.sub(r"\1XXXXXX", line)
+        killed = KILLED.match(line)
+        if killed:
+            signal = killed.group(1)
         match = CALL.match(line)
         if not match:
             continue
         name, arguments, result, rest = match.groups()
         seen[name] = seen.get(name, 0) + 1
-        if name == "execve" and arguments.startswith('"/.kestrel"'):
+        if name == "execve" and arguments.startswith(f'"{program}"'):
             start = Call(name, arguments, result, rest, 1, seen[name])
             if result != "0":
                 start = None
@@ -146,22 +173,22 @@ def parse(lines, device=None):
         if start:
             occurrence = seen[name] - kestrel_start.get(name, 0)
             calls.append(Call(name, arguments, result, rest, occurrence, seen[name]))
-    return Trace(start, calls, killed)
+    return Trace(start, calls, signal)
 
 
-def read(trace_file, device=None):
+def read(trace_file, device=None, program=KESTREL_START):
     """The parsed trace file, or None where strace wrote none."""
     if not os.path.exists(trace_file):
         return None
     with open(trace_file, encoding="latin-1") as lines:
-        return parse(lines, device)
+        return parse(lines, device, program)
 
 
 def touches_files(call):
     """A file-system call: one that names a file, or one that acts on a
     descriptor of a file; the standard streams are not the device's files.
     strace's own classes (%file, %desc) chose what the trace holds."""
-    if STANDARD_STREAM.match(call.arguments):
+    if STANDARD_STREAM.match(call.arguments) or LIBRARIES.match(subject(call)):
         return False
     return call.arguments.startswith(('"', "AT_FDCWD")) or bool(
         DESCRIPTOR.search(call.arguments)

@@ -2,6 +2,8 @@
 
 - states.faults: the representative states of the fault matrix and the
   crash points, trees of the scenarios whose "before:" tree is that state;
+- states.data_commands: the states on which the same two tools run
+  kestrel-data stage and clean;
 - states.boot: var/db laid out over a booted system's real system
   partition, with what the booted system must show;
 - states.bench: the sample device shaped for measuring.
