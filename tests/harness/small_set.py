@@ -17,7 +17,8 @@ ZONES = ("Europe/Paris", "America/Los_Angeles", "Asia/Tokyo", "Etc/UTC")
 
 
 def cut(text, zones):
-    """Source lines of the zones, with every rule; no links, no comments."""
+    """Source lines of the zones, with every rule and the links to them (zic
+    makes those hard links, which staging must keep); no comments."""
     kept = []
     keeping = False
     for line in text.splitlines():
@@ -29,7 +30,8 @@ def cut(text, zones):
                 kept.append(line)
             continue
         keeping = fields[:1] == ["Zone"] and fields[1] in zones
-        if keeping or fields[:1] == ["Rule"]:
+        linked = fields[:1] == ["Link"] and fields[1] in zones
+        if keeping or linked or fields[:1] == ["Rule"]:
             kept.append(line)
     return "\n".join(kept) + "\n"
 
