@@ -163,7 +163,26 @@ def readers(results, name, zone, want_offset, facts, contexts=SERVICE_AND_LOGIN)
         if len(said) > 6:
             wrong += expect(f"{where}: ICU's data", facts["release"], local[4])
             wrong += probe_check(where, said[3:], facts)
+    if "service" in contexts:
+        wrong += timedated(results, name)
     return wrong
+
+
+def timedated(results, name):
+    """timedated names no zone (/etc/localtime leads to kestrel's link, not
+    into /usr/share/zoneinfo); timedatectl, run by the collector's service,
+    shows the time in the zone date of a service names."""
+    shown = dict(
+        line.partition("=")[::2]
+        for line in (text(results, f"{name}.timedatectl") or "").splitlines()
+    )
+    service = (text(results, f"{name}.service") or "").splitlines() + [""] * 2
+    abbreviation = (service[1].split() + [""] * 2)[1][:-5]
+    return expect(
+        f"{name}: timedatectl's zone and time",
+        ("", abbreviation),
+        (shown.get("Timezone", ""), shown.get("TimeUSec", "").rpartition(" ")[2]),
+    )
 
 
 def probe_check(where, lines, facts):
