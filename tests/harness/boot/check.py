@@ -213,3 +213,16 @@ def local_time_matches(got, sandbox_dates, sandbox_zdump, expected):
     if got.zdump != sandbox_zdump:
         wrong.append(f"zdump reports {got.zdump}, sandbox {sandbox_zdump}")
     return wrong
+
+
+def boot_matches(got, run, tree, expected):
+    """One boot against the device sandbox's RUN of the same start and the
+    EXPECTED links, files, absences, warnings, agent and dates."""
+    return (
+        unit_ran_once(got)
+        + warnings_match(got, run["lines"], expected["warnings"])
+        + finished_first(got)
+        + clean_up_agent(got, run["clean"], expected["agent"])
+        + tree_matches(tree, run["tree"], expected)
+        + local_time_matches(got, run["dates"], run["zdump"], expected)
+    )

@@ -131,7 +131,9 @@ def run_lifecycle(prepared, deb, work, log, boots=len(BOOTS)):
     wrong, start = [], None  # None: the prepared tree's var/db
     log(
         f"lifecycle: system data {facts['system']}, sets built in "
-        f"{time.monotonic() - started:.0f} s"
+        f"{time.monotonic() - started:.0f} s; {image.USER_ZONE} on "
+        f"2026-11-18: {facts['edmonton_image']} in {facts['system']}, "
+        f"{facts['edmonton']} in {RELEASE}"
     )
     for name, steps in BOOTS[:boots]:
         run, before = sandbox_from(prepared, work, start, programs)

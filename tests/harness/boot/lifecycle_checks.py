@@ -9,12 +9,12 @@ import subprocess
 from .. import device, layout
 from .. import tree as trees
 from . import check, image
+from .lifecycle_steps import expect, readers, staging, text
 
 R = layout.rel
 STAGED = layout.STAGED_DIR
 EDMONTON = ["MST-0700", "MDT-0600"]  # at the collector's 2025 instants
 TOKYO = ["JST+0900", "JST+0900"]
-SERVICE_AND_LOGIN = ("service", "login")
 
 
 def zone_names(zoneinfo):
@@ -62,37 +62,8 @@ def facts(prepared, built, release, instant):
     }
 
 
-def text(results, name):
-    path = os.path.join(results, name)
-    if not os.path.exists(path):
-        return None
-    with open(path, errors="replace") as read:
-        return read.read()
-
-
-def expect(what, want, got):
-    return [] if want == got else [f"{what}: {got!r}, expected {want!r}"]
-
-
 def staged(version):
     return STAGED + version
-
-
-def link_targets(tree):
-    return {
-        path: entry[1]
-        for path, entry in tree.items()
-        if entry[0] == "link" and "/tz/" not in path
-    }
-
-
-def staged_sets(tree):
-    prefix = R(STAGED)
-    return sorted(
-        path[len(prefix) :]
-        for path in tree
-        if path.startswith(prefix) and "/" not in path[len(prefix) :]
-    )
 
 
 def links(version, zone=image.USER_ZONE):
@@ -105,100 +76,6 @@ def links(version, zone=image.USER_ZONE):
     if data:
         found[R(layout.ICUTZ_LINK)] = data + "/icutz"
     return found
-
-
-def boot_matches(got, run, tree, expected):
-    """kestrel and the agent as in the device sandbox and as EXPECTED."""
-    return (
-        check.unit_ran_once(got)
-        + check.warnings_match(got, run["lines"], expected["warnings"])
-        + check.finished_first(got)
-        + check.clean_up_agent(got, run["clean"], expected["agent"])
-        + check.tree_matches(tree, run["tree"], expected)
-        + check.local_time_matches(got, run["dates"], run["zdump"], expected)
-    )
-
-
-def staging(results, name, status, latest):
-    """Step NAME of kestrel-data stage ended with STATUS and left tz_latest
-    at LATEST and no scratch directory."""
-    tar = os.path.join(results, name + ".var-db.tar")
-    if not os.path.exists(tar):
-        return [f"{name}: the step left no results ({text(results, 'steps.log')})"]
-    after = trees.from_tar(tar, "var/db")
-    said = text(results, name + ".out")
-    wrong = expect(
-        f"{name}: kestrel-data stage's status ({said})",
-        status,
-        (text(results, name + ".status") or "").strip(),
-    )
-    wrong += expect(
-        f"{name}: tz_latest", ("link", latest), after.get(R(layout.LATEST_LINK))
-    )
-    leftovers = [s for s in staged_sets(after) if s.startswith(".stage-")]
-    return wrong + expect(f"{name}: scratch directories", [], leftovers)
-
-
-def readers(results, name, zone, want_offset, facts, contexts=SERVICE_AND_LOGIN):
-    """What a service and a login read (kestrel-boot-readers): the zone
-    variables; ZONE as the local zone of ICU, with glibc's date and ICU both
-    at WANT_OFFSET at the readers' instant; and, where the step ran it, the
-    ICU probe's check: ICU's data the adopted release, every zone and link
-    name of it the same in ICU as in glibc."""
-    wrong = []
-    for context in contexts:
-        said = (text(results, f"{name}.{context}") or "").splitlines() + [""] * 3
-        where = f"{name}: {context}"
-        wrong += expect(
-            f"{where}: variables",
-            f"variables: TZ={zone} TZDIR={layout.ZONEINFO_LINK} "
-            f"ICU_TIMEZONE_FILES_DIR={layout.ICUTZ_LINK}",
-            said[0],
-        )
-        local = said[1].split() + [""] * 5
-        wrong += expect(f"{where}: ICU's local zone", zone, local[3])
-        wrong += expect(f"{where}: date's offset", want_offset, local[1][-5:])
-        icu = said[2].split() + [""] * 3
-        wrong += expect(f"{where}: ICU's offset", want_offset, icu[2].replace(":", ""))
-        if len(said) > 6:
-            wrong += expect(f"{where}: ICU's data", facts["release"], local[4])
-            wrong += probe_check(where, said[3:], facts)
-    if "service" in contexts:
-        wrong += timedated(results, name)
-    return wrong
-
-
-def timedated(results, name):
-    """timedated names no zone (/etc/localtime leads to kestrel's link, not
-    into /usr/share/zoneinfo); timedatectl, run by the collector's service,
-    shows the time in the zone date of a service names."""
-    shown = dict(
-        line.partition("=")[::2]
-        for line in (text(results, f"{name}.timedatectl") or "").splitlines()
-    )
-    service = (text(results, f"{name}.service") or "").splitlines() + [""] * 2
-    abbreviation = (service[1].split() + [""] * 2)[1][:-5]
-    return expect(
-        f"{name}: timedatectl's zone and time",
-        ("", abbreviation),
-        (shown.get("Timezone", ""), shown.get("TimeUSec", "").rpartition(" ")[2]),
-    )
-
-
-def probe_check(where, lines, facts):
-    """kestrel-icu-probe check found ICU's data of the release and no zone
-    name of it reading otherwise than in glibc."""
-    release = facts["release"]
-    wanted = [
-        f"ICU tz version: {release} (release {release})",
-        f"zones: {len(facts['zones'])}",
-        "disagreements: 0",
-        "check status: 0",
-    ]
-    missing = [line for line in wanted if line not in lines]
-    return (
-        [f"{where}: the ICU probe's check lacks {missing}: {lines}"] if missing else []
-    )
 
 
 def clean_run(got, run, start, tree, results, facts):
@@ -216,7 +93,7 @@ def clean_run(got, run, start, tree, results, facts):
         "agent": False,
         "date": EDMONTON,
     }
-    return boot_matches(got, run, tree, expected) + staging(
+    return check.boot_matches(got, run, tree, expected) + staging(
         results, "staged", "0", staged(facts["release"] + ".1.1")
     )
 
@@ -234,7 +111,7 @@ def adopted(got, run, start, tree, results, facts):
         "agent": False,
         "date": EDMONTON,
     }
-    wrong = boot_matches(got, run, tree, expected)
+    wrong = check.boot_matches(got, run, tree, expected)
     wrong += readers(results, "readers", image.USER_ZONE, facts["edmonton"], facts)
     return wrong + staging(results, "restaged", "0", staged(facts["release"] + ".1.2"))
 
@@ -252,7 +129,7 @@ def re_release_adopted(got, run, start, tree, results, facts):
         "agent": True,
         "date": EDMONTON,
     }
-    wrong = boot_matches(got, run, tree, expected)
+    wrong = check.boot_matches(got, run, tree, expected)
     removed = sorted(set(start) - set(tree))
     older = R(staged(first))
     wrong += expect(
@@ -298,19 +175,12 @@ def after_power_off(got, run, start, tree, results, facts):
         "date": TOKYO,
     }
     kept = {path: entry for path, entry in tree.items() if path not in leftovers}
-    wrong = boot_matches(got, run, kept, expected)
+    wrong = check.boot_matches(got, run, kept, expected)
     if not leftovers:
         wrong.append("no scratch directory of the cut-short staging")
     wrong += readers(results, "zone_next_boot", "Asia/Tokyo", "+0900", facts)
     wrong += staging(results, "next_staging", "0", staged(facts["release"] + ".1.3"))
-    before = os.path.join(results, "incompatible.before.var-db.tar")
-    after = os.path.join(results, "incompatible.var-db.tar")
-    if os.path.exists(before) and os.path.exists(after):
-        wrong += expect(
-            "/var/db after the refused staging",
-            trees.from_tar(before, "var/db"),
-            trees.from_tar(after, "var/db"),
-        )[:1]
+    wrong += unchanged(results, "incompatible")
     said = text(results, "incompatible.out") or ""
     wrong += expect(
         "the other schema's staging status",
@@ -320,6 +190,19 @@ def after_power_off(got, run, start, tree, results, facts):
     if '"44b"' not in said:
         wrong.append(f"the refusal does not name the schema: {said!r}")
     return wrong
+
+
+def unchanged(results, name):
+    """Step NAME left /var/db as it found it, entry by entry."""
+    tars = [os.path.join(results, name + end) for end in (".before", "")]
+    tars = [tar + ".var-db.tar" for tar in tars]
+    if not all(map(os.path.exists, tars)):
+        return [f"{name}: no /var/db before and after"]
+    before, after = (trees.from_tar(tar, "var/db") for tar in tars)
+    changed = [
+        path for path in set(before) | set(after) if before.get(path) != after.get(path)
+    ]
+    return expect(f"{name}: what changed in /var/db", [], sorted(changed))
 
 
 BOOTS = {
