@@ -59,7 +59,8 @@ verdict may_stage(const std::string& release, const std::string& schema) {
   const kal_dataset designated = designated_set();
   if (!(candidate > release_part(system.version))) {
     return {false, "release " + release + " is not newer than " +
-                       system.get_version_string() + " of the system partition"};
+                       system.get_version_string() +
+                       " of the system partition"};
   }
   // A re-release of the designated set's release is staged under the next
   // N of that release, which kestrel takes as newer.
@@ -68,9 +69,9 @@ verdict may_stage(const std::string& release, const std::string& schema) {
                        designated.get_version_string() +
                        ", the set the links designate"};
   }
-  return {true, "release " + release +
-                    (candidate > release_part(designated.version)
-                         ? " is newer than "
-                         : " re-releases ") +
-                    designated.get_version_string()};
+  return {true,
+          "release " + release +
+              (candidate > release_part(designated.version) ? " is newer than "
+                                                            : " re-releases ") +
+              designated.get_version_string()};
 }
