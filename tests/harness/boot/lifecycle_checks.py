@@ -170,7 +170,10 @@ def after_power_off(got, run, start, tree, results, facts):
             R(layout.VERSION_RECORD): f"{facts['release']}.1.1_{second}".encode()
         },
         "absent": [R(layout.NEEDS_CLEANUP)],
-        "warnings": [],
+        # tz_latest still names the set adopted the boot before.
+        "warnings": [
+            f"New update not compatible or older version: {second} vs. {second}"
+        ],
         "agent": False,
         "date": TOKYO,
     }
