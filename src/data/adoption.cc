@@ -59,14 +59,21 @@ verdict may_stage(const std::string& release, const std::string& schema) {
   const kal_version candidate = release_part(kal_version(release + ".1.0"));
   const kal_dataset system;
   const kal_dataset designated = designated_set();
-  for (const kal_dataset* other : {&system, &designated}) {
-    if (!(candidate > release_part(other->version))) {
-      return {false, "release " + release + " is not newer than " +
-                         other->get_version_string() +
-                         (other == &system ? " of the system partition"
-                                           : ", the set the links designate")};
-    }
+  if (!(candidate > release_part(system.version))) {
+    return {false, "release " + release + " is not newer than " +
+                       system.get_version_string() +
+                       " of the system partition"};
   }
-  return {true, "release " + release + " is newer than " +
-                    designated.get_version_string()};
+  // A re-release of the designated set's release is staged under the next
+  // N of that release, which kestrel takes as newer.
+  if (release_part(designated.version) > candidate) {
+    return {false, "release " + release + " is older than " +
+                       designated.get_version_string() +
+                       ", the set the links designate"};
+  }
+  return {true,
+          "release " + release +
+              (candidate > release_part(designated.version) ? " is newer than "
+                                                            : " re-releases ") +
+              designated.get_version_string()};
 }

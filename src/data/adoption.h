@@ -22,9 +22,10 @@ struct verdict {
 verdict kestrel_would_adopt(const std::string& set_path);
 
 // Whether a set of this release and ICU schema may be staged: its schema
-// must be the system partition's, and its release newer than the system
-// partition's and than that of the set the links designate, so that
-// kestrel adopts it at the next start, whatever N its RELEASE.1.N gets.
+// must be the system partition's, its release newer than the system
+// partition's and not older than that of the set the links designate, so
+// that kestrel adopts it at the next start: a re-release of the designated
+// release gets an N above the designated set's.
 verdict may_stage(const std::string& release, const std::string& schema);
 
 #endif  // KESTREL_DATA_ADOPTION_H_

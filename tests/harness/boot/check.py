@@ -38,6 +38,7 @@ class results:
     def __init__(self, directory):
         self.directory = directory
         self.kestrel = read_show(os.path.join(directory, "kestrel.show"))[0]
+        self.clean = read_show(os.path.join(directory, "clean.show"))[0]
         self.units = {
             unit["Id"]: unit
             for unit in read_show(os.path.join(directory, "units.show"))
@@ -50,15 +51,31 @@ class results:
         with open(os.path.join(self.directory, name)) as text:
             return text.read().splitlines()
 
-    def warnings(self):
+    def warnings(self, unit="kestrel.service"):
         return [
             entry["MESSAGE"]
             for entry in self.journal
-            if entry.get("_SYSTEMD_UNIT") == "kestrel.service"
+            if entry.get("_SYSTEMD_UNIT") == unit
+        ]
+
+    def starts(self, unit):
+        """systemd's "Starting" job messages for UNIT."""
+        return [
+            entry
+            for entry in self.journal
+            if entry.get("UNIT") == unit and entry.get("MESSAGE_ID") == STARTING
         ]
 
     def microseconds(self, key, unit=None):
-        return int((self.units[unit] if unit else self.kestrel).get(key) or 0)
+        """A value of kestrel's systemctl show, of the agent's ("clean") or of
+        another unit's."""
+        if unit is None:
+            shown = self.kestrel
+        elif unit == "clean":
+            shown = self.clean
+        else:
+            shown = self.units[unit]
+        return int(shown.get(key) or 0)
 
     def duration_ms(self):
         return (
@@ -81,12 +98,7 @@ def unit_ran_once(got):
             wrong.append(
                 f"kestrel.service {key}={got.kestrel.get(key)}, " f"expected {value}"
             )
-    starts = [
-        entry
-        for entry in got.journal
-        if entry.get("UNIT") == "kestrel.service"
-        and entry.get("MESSAGE_ID") == STARTING
-    ]
+    starts = got.starts("kestrel.service")
     if len(starts) != 1:
         wrong.append(f"the journal holds {len(starts)} starts of kestrel")
     pids = {
@@ -111,6 +123,43 @@ def warnings_match(got, sandbox_lines, expected):
         prefixes = [line.rsplit(": ", 1)[0] for line in lines]
         if prefixes != ["kestrel: " + text for text in expected]:
             wrong.append(f"warnings {lines}, expected {expected}")
+    return wrong
+
+
+def clean_up_agent(got, sandbox_clean, expected):
+    """The agent (kestrel-clean.service, started by its path unit) ran once,
+    after kestrel had finished, and said and ended as kestrel-data clean did
+    in the device sandbox, exactly when kestrel left its marker; otherwise it
+    never started. EXPECTED says whether the state's boot sets the marker."""
+    unit = "kestrel-clean.service"
+    started = got.microseconds("InactiveExitTimestampMonotonic", "clean")
+    starts = len(got.starts(unit))
+    lines = got.warnings(unit)
+    if sandbox_clean is None:
+        wrong = [] if not expected else ["kestrel set no clean-up marker"]
+        if started or starts or lines:
+            wrong.append(
+                f"{unit} ran ({starts} starts, lines {lines}) without a marker"
+            )
+        return wrong
+    wrong = [] if expected else ["kestrel set the clean-up marker"]
+    ended = got.microseconds("ExecMainExitTimestampMonotonic")
+    if starts != 1 or not started > ended:
+        wrong.append(
+            f"{unit} started {starts} times, at {started} us, kestrel ended at {ended}"
+        )
+    status = got.clean.get("ExecMainStatus")
+    if status != str(sandbox_clean["status"]) or (
+        status == "0" and got.clean.get("Result") != "success"
+    ):
+        wrong.append(
+            f"{unit} Result={got.clean.get('Result')} status {status}, "
+            f"sandbox status {sandbox_clean['status']}"
+        )
+    if lines != sandbox_clean["lines"]:
+        wrong.append(
+            f"{unit} said {lines}, the sandbox's clean {sandbox_clean['lines']}"
+        )
     return wrong
 
 
@@ -164,3 +213,16 @@ def local_time_matches(got, sandbox_dates, sandbox_zdump, expected):
     if got.zdump != sandbox_zdump:
         wrong.append(f"zdump reports {got.zdump}, sandbox {sandbox_zdump}")
     return wrong
+
+
+def boot_matches(got, run, tree, expected):
+    """One boot against the device sandbox's RUN of the same start and the
+    EXPECTED links, files, absences, warnings, agent and dates."""
+    return (
+        unit_ran_once(got)
+        + warnings_match(got, run["lines"], expected["warnings"])
+        + finished_first(got)
+        + clean_up_agent(got, run["clean"], expected["agent"])
+        + tree_matches(tree, run["tree"], expected)
+        + local_time_matches(got, run["dates"], run["zdump"], expected)
+    )

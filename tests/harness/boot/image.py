@@ -11,7 +11,11 @@ from .. import SOURCE, layout
 from ..states import boot as states
 
 GUEST = os.path.join(SOURCE, "tests", "boot", "guest")
+GUEST_PROGRAMS = ["kestrel-boot-collect", "kestrel-boot-steps", "kestrel-boot-readers"]
 IMAGE_SIZE = "2G"
+# The zone the test system's user chose before installing kestrel: one whose
+# abbreviation alone does not name it, and whose rules 2026c changed.
+USER_ZONE = "America/Edmonton"
 
 
 def run(*command):
@@ -44,18 +48,20 @@ def check_layout(root):
         raise RuntimeError(f"/etc/localtime points at {localtime}")
 
 
-def hold_clean_up_agent(root):
-    # Each state's /var/db after a boot is compared with kestrel's run in the
-    # device sandbox alone, so the clean-up agent, which would act on the
-    # marker kestrel leaves, is masked here.
-    run("systemctl", "--root=" + root, "mask", "kestrel-clean.path")
+def choose_zone(root):
+    # The system's user chose a zone before installing kestrel, as tzdata's
+    # own configuration does; the package must keep it.
+    localtime = os.path.join(root, "etc/localtime")
+    if os.path.lexists(localtime):
+        os.remove(localtime)
+    os.symlink("/usr/share/zoneinfo/" + USER_ZONE, localtime)
+    with open(os.path.join(root, "etc/timezone"), "w") as timezone:
+        timezone.write(USER_ZONE + "\n")
 
 
 def install_collector(root):
-    shutil.copy(
-        os.path.join(GUEST, "kestrel-boot-collect"),
-        os.path.join(root, "usr/local/sbin/"),
-    )
+    for program in GUEST_PROGRAMS:
+        shutil.copy(os.path.join(GUEST, program), os.path.join(root, "usr/local/sbin/"))
     shutil.copy(
         os.path.join(GUEST, "kestrel-boot-collect.service"),
         os.path.join(root, "etc/systemd/system/"),
@@ -68,9 +74,9 @@ def prepare(base, root, deb):
     ROOT (made anew; the base stays as it is)."""
     shutil.rmtree(root, ignore_errors=True)
     run("cp", "-a", base, root)
+    choose_zone(root)
     install_package(root, deb)
     check_layout(root)
-    hold_clean_up_agent(root)
     install_collector(root)
 
 
@@ -90,9 +96,15 @@ def state_image(prepared, work, name):
     run("cp", "-al", prepared, root)
     shutil.rmtree(os.path.join(root, "var/db"), ignore_errors=True)
     expected = states.lay_out(root, name)
+    image = disk_image(root, work)
+    shutil.rmtree(root)
+    return image, expected
+
+
+def disk_image(root, work):
+    """WORK/root.img, the root file system made of the tree ROOT."""
     image = os.path.join(work, "root.img")
     if os.path.exists(image):
         os.remove(image)
     run("mkfs.ext4", "-q", "-F", "-L", "root", "-d", root, image, IMAGE_SIZE)
-    shutil.rmtree(root)
-    return image, expected
+    return image

@@ -1,6 +1,7 @@
 """Boots a disk image in QEMU (TCG: nested KVM stalls on this machine kind)
-with a small results disk beside it, and reads the results back with
-debugfs once the system has powered itself off."""
+with a results disk beside it, which may also bring the boot the steps to
+run and their files, and reads the results back with debugfs once the
+system has powered itself off."""
 
 import os
 import shutil
@@ -10,19 +11,24 @@ import time
 from . import image
 
 BOOT_TIMEOUT = 600
-RESULTS_SIZE = "64M"
+# Room for the lifecycle's archives and its several copies of /var/db.
+RESULTS_SIZE = "512M"
 
 
 class boot_failed(Exception):
     pass
 
 
-def boot(root_image, prepared, work, name):
-    """Boots ROOT_IMAGE; returns (results directory, seconds). The serial
+def boot(root_image, prepared, work, name, inputs=None):
+    """Boots ROOT_IMAGE; returns (results directory, seconds). The results
+    disk starts with the files of the directory INPUTS, if given. The serial
     log stays in WORK as NAME.serial.log."""
     results_image = os.path.join(work, name + ".results.img")
+    contents = ["-d", inputs] if inputs else []
     subprocess.run(
-        ["mkfs.ext4", "-q", "-F", "-L", "results", results_image, RESULTS_SIZE],
+        ["mkfs.ext4", "-q", "-F", "-L", "results"]
+        + contents
+        + [results_image, RESULTS_SIZE],
         check=True,
     )
     serial = os.path.join(work, name + ".serial.log")
@@ -71,6 +77,15 @@ def boot(root_image, prepared, work, name):
     if not os.path.exists(os.path.join(results, "complete")):
         raise boot_failed("the collector left no complete set of results")
     return results, seconds
+
+
+def boot_or_report(root_image, prepared, work, name, wrong, inputs=None):
+    """boot(), or None with the reason the boot failed added to WRONG."""
+    try:
+        return boot(root_image, prepared, work, name, inputs)
+    except boot_failed as failure:
+        wrong.append(f"{name}: {failure}")
+        return None
 
 
 def serial_tail(work, name, lines=40):

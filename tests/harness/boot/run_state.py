@@ -16,11 +16,17 @@ INSTANTS = ["1736942400", "1752580800"]
 SANDBOX_TIMEOUT = 60
 
 
-def packaged_kestrel(deb, work):
-    tree = os.path.join(work, "unpacked")
-    shutil.rmtree(tree, ignore_errors=True)
-    subprocess.run(["dpkg-deb", "-x", deb, tree], check=True)
-    return os.path.join(tree, "usr/sbin/kestrel")
+class packaged:
+    """The package's programs, unpacked into WORK, for the device sandbox and
+    for making data sets on this machine."""
+
+    def __init__(self, deb, work):
+        tree = os.path.join(work, "unpacked")
+        shutil.rmtree(tree, ignore_errors=True)
+        subprocess.run(["dpkg-deb", "-x", deb, tree], check=True)
+        self.kestrel = os.path.join(tree, "usr/sbin/kestrel")
+        self.data = os.path.join(tree, "usr/bin/kestrel-data")
+        self.probe = os.path.join(tree, "usr/libexec/kestrel/kestrel-icu-probe")
 
 
 def read_local_time(root):
@@ -59,28 +65,48 @@ def bare_device(prepared, work):
     return root
 
 
-def sandbox_runs(prepared, work, name, kestrel):
-    """The state on a bare device root, run twice: per run the lines, the
-    var/db tree and what date and zdump report."""
+def clean_up_agent(root, programs):
+    """What the clean-up agent does on the device root when kestrel left its
+    marker there: kestrel-data clean's lines (standard output and error, as
+    the journal takes them) and status; None without the marker."""
+    if not os.path.exists(os.path.join(root, layout.rel(layout.NEEDS_CLEANUP))):
+        return None
+    ran = subprocess.run(
+        [sandbox.SANDBOX, root, programs.data, "clean"],
+        stdin=subprocess.DEVNULL,
+        stdout=subprocess.PIPE,
+        stderr=subprocess.STDOUT,
+        timeout=SANDBOX_TIMEOUT,
+        check=False,
+    )
+    return {"lines": ran.stdout.decode().splitlines(), "status": ran.returncode}
+
+
+def sandbox_boot(root, programs):
+    """A boot's work on the device root: kestrel, then the clean-up agent if
+    kestrel set the marker; their lines and status, what date and zdump
+    report and the var/db tree afterwards."""
+    # A hang gives no lines and the status "timeout".
+    ran = sandbox.run_kestrel(root, programs.kestrel, timeout=SANDBOX_TIMEOUT)
+    lines = [] if ran.timed_out else ran.lines()
+    status = "timeout" if ran.timed_out else ran.returncode
+    clean = clean_up_agent(root, programs)
+    dates, zdump = read_local_time(root)
+    return {
+        "lines": lines,
+        "status": status,
+        "clean": clean,
+        "dates": dates,
+        "zdump": zdump,
+        "tree": trees.read(os.path.join(root, "var/db"), "var/db/"),
+    }
+
+
+def sandbox_runs(prepared, work, name, programs):
+    """The state on a bare device root, booted twice."""
     root = bare_device(prepared, work)
     states.lay_out(root, name)
-    runs = []
-    for _ in range(2):
-        # A hang gives no lines and the status "timeout".
-        ran = sandbox.run_kestrel(root, kestrel, timeout=SANDBOX_TIMEOUT)
-        lines = [] if ran.timed_out else ran.lines()
-        status = "timeout" if ran.timed_out else ran.returncode
-        dates, zdump = read_local_time(root)
-        tree = trees.read(os.path.join(root, "var/db"), "var/db/")
-        runs.append(
-            {
-                "lines": lines,
-                "status": status,
-                "dates": dates,
-                "zdump": zdump,
-                "tree": tree,
-            }
-        )
+    runs = [sandbox_boot(root, programs) for _ in range(2)]
     shutil.rmtree(root)
     return runs
 
@@ -91,16 +117,6 @@ def links_and_record(tree):
         for path, entry in tree.items()
         if entry[0] == "link" or path.endswith("/TZVersionDiffRecord")
     }
-
-
-def check_boot(got, run, expected, tree):
-    return (
-        check.unit_ran_once(got)
-        + check.warnings_match(got, run["lines"], expected["warnings"])
-        + check.finished_first(got)
-        + check.tree_matches(tree, run["tree"], expected)
-        + check.local_time_matches(got, run["dates"], run["zdump"], expected)
-    )
 
 
 def run_state(name, prepared, deb, work, log):
@@ -119,7 +135,7 @@ def run_state(name, prepared, deb, work, log):
     started = time.monotonic()
     root_image, expected = image.state_image(prepared, work, name)
     row["image"] = time.monotonic() - started
-    runs = sandbox_runs(prepared, work, name, packaged_kestrel(deb, work))
+    runs = sandbox_runs(prepared, work, name, packaged(deb, work))
     for number, run in enumerate(runs, 1):
         if run["status"] != 0:
             log(
@@ -129,11 +145,10 @@ def run_state(name, prepared, deb, work, log):
     wrong, booted = [], []
     for number, run in enumerate(runs, 1):
         boot_name = f"boot{number}"
-        try:
-            results, seconds = qemu.boot(root_image, prepared, work, boot_name)
-        except qemu.boot_failed as failure:
-            wrong.append(f"{boot_name}: {failure}")
+        booted_now = qemu.boot_or_report(root_image, prepared, work, boot_name, wrong)
+        if booted_now is None:
             break
+        results, seconds = booted_now
         got = check.results(results)
         tree = trees.from_tar(os.path.join(results, "var-db.tar"), "var/db")
         row[boot_name] = seconds
@@ -143,13 +158,15 @@ def run_state(name, prepared, deb, work, log):
             f"{got.duration_ms():.1f} ms, lines {got.warnings()}"
         )
         if number == 2:
-            expected = dict(expected, warnings=None, files={}, absent=[])
+            # The first boot's agent consumed the marker.
+            expected = dict(expected, warnings=None, files={}, absent=[], agent=False)
             if links_and_record(tree) != links_and_record(booted[0]):
                 wrong.append(
                     "boot2: the second boot changed the links or " "the record"
                 )
         wrong += [
-            f"{boot_name}: {text}" for text in check_boot(got, run, expected, tree)
+            f"{boot_name}: {text}"
+            for text in check.boot_matches(got, run, tree, expected)
         ]
         booted.append(tree)
     if wrong:

@@ -14,7 +14,7 @@ import shutil
 import subprocess
 
 from .. import SOURCE, device, layout, sandbox
-from . import check, qemu, run_state, unit_variants
+from . import check, image, qemu, run_state, unit_variants
 
 KESTREL = "/usr/sbin/kestrel"
 NOTHING = "/usr/local/sbin/kestrel-do-nothing"
@@ -99,12 +99,9 @@ def cost_image(prepared, work, shipped, order, program):
     common_start(root, system_release(root))
     shutil.copy(program, root + NOTHING)
     install_variants(root, shipped, order)
-    image = os.path.join(work, "root.img")
-    subprocess.run(
-        ["mkfs.ext4", "-q", "-F", "-L", "root", "-d", root, image, "2G"], check=True
-    )
+    disk = image.disk_image(root, work)
     shutil.rmtree(root)
-    return image
+    return disk
 
 
 def expected_lines(prepared, work, kestrel):
@@ -188,13 +185,12 @@ def measure(prepared, work, kestrel, boots, groups, log):
     for number in range(boots):
         turn = number * len(variants) // boots
         order = variants[turn:] + variants[:turn]
-        image = cost_image(prepared, work, shipped, order, program)
+        disk = cost_image(prepared, work, shipped, order, program)
         name = f"cost{number + 1}"
-        try:
-            results, seconds = qemu.boot(image, prepared, work, name)
-        except qemu.boot_failed as failure:
-            wrong.append(f"{name}: {failure}")
+        booted = qemu.boot_or_report(disk, prepared, work, name, wrong)
+        if booted is None:
             continue
+        results, seconds = booted
         got, more = check_boot(check.results(results), order, lines, name)
         wrong += more
         for unit, ms in got.items():

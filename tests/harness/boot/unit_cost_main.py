@@ -7,14 +7,14 @@ import datetime
 import os
 
 from . import cost_table, unit_cost
-from .run_state import packaged_kestrel
+from .run_state import packaged
 
 
 def run(prepared, deb, work, options, log):
     groups = options.unit_cost
     boots = options.cost_boots or (5 if groups else 3)
     log(f"unit cost: {boots} boots of the common start")
-    kestrel = packaged_kestrel(deb, work)
+    kestrel = packaged(deb, work).kestrel
     shipped, variants, times, wrong = unit_cost.measure(
         prepared, work, kestrel, boots, groups, log
     )

@@ -1,6 +1,8 @@
 """The device states of the boot test. Each writes var/db of a device root
 whose system partition (usr/share/zoneinfo.default, usr/share/icu) is already
-in place, and names what the booted system must show afterwards."""
+in place, and names what the booted system must show afterwards, the
+clean-up agent's work included ("agent": whether kestrel leaves the marker
+that starts it)."""
 
 import os
 
@@ -28,6 +30,7 @@ def update_adopted(root, release):
         "files": {R(layout.VERSION_RECORD): f"{release}.1.0_{release}.1.1".encode()},
         "absent": [R(layout.NEEDS_CLEANUP)],
         "warnings": [],
+        "agent": False,
         "date": ["KTEST+0130", "KTEST+0130"],
     }
 
@@ -39,11 +42,18 @@ def older_data_reset(root, release):
     device.link(root, ZONEINFO_LINK, old + "/zoneinfo")
     device.link(root, layout.ICUTZ_LINK, old + "/icutz")
     device.link(root, LOCALTIME_LINK, layout.zone_link_target("Europe/Paris"))
+    # The agent removes the abandoned set and consumes the marker.
     return {
         "links": {R(ZONEINFO_LINK): layout.SYSTEM_ZONEINFO},
-        "files": {R(layout.NEEDS_CLEANUP): b""},
-        "absent": [R(layout.ICUTZ_LINK), R(layout.VERSION_RECORD)],
+        "files": {},
+        "absent": [
+            R(layout.ICUTZ_LINK),
+            R(layout.VERSION_RECORD),
+            R(layout.NEEDS_CLEANUP),
+            R(old),
+        ],
         "warnings": ["Symlink points at data incompatible with installed system"],
+        "agent": True,
         "date": PARIS,
     }
 
@@ -57,6 +67,7 @@ def localtime_old_style_corrected(root, release):
         "files": {},
         "absent": [R(layout.NEEDS_CLEANUP)],
         "warnings": ["Correcting localtime link to " + zone],
+        "agent": False,
         "date": ["JST+0900", "JST+0900"],
     }
 
@@ -68,6 +79,7 @@ def localtime_missing_default(root, release):
         "files": {},
         "absent": [R(layout.NEEDS_CLEANUP)],
         "warnings": [f"localtime link invalid; resetting to {layout.DEFAULT_ZONE}"],
+        "agent": False,
         "date": ["PST-0800", "PDT-0700"],
     }
 
@@ -88,6 +100,7 @@ def fifo_staged_version(root, release):
         "files": {R(layout.VERSION_RECORD): f"{release}.1.0_{release}.1.1".encode()},
         "absent": [R(layout.NEEDS_CLEANUP)],
         "warnings": [],
+        "agent": False,
         "date": PARIS,
     }
 

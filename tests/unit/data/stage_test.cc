@@ -67,6 +67,20 @@ TEST_F(stage_test, kestrel_adopts_the_staged_set_at_its_next_start) {
             "2025b.1.0_2026a.1.1");
 }
 
+TEST_F(stage_test, kestrel_adopts_a_re_release_of_the_designated_release) {
+  make_device("2025b");
+  (void)stage_set(load_set(kSet));
+  ASSERT_EQ(child_process({KESTREL_BINARY}).run(), 0);
+  EXPECT_EQ(stage_set(load_set(kSet)), "/var/db/timezone/tz/2026a.1.2");
+  EXPECT_EQ(child_process({KESTREL_BINARY}).run(), 0);
+  EXPECT_EQ(tree::link_target("/var/db/timezone/zoneinfo"),
+            "/var/db/timezone/tz/2026a.1.2/zoneinfo");
+  EXPECT_EQ(tree::file_content("/var/db/timezone/TZVersionDiffRecord"),
+            "2026a.1.1_2026a.1.2");
+  // The set it replaces is left for the clean-up agent.
+  EXPECT_TRUE(tree::present("/var/db/timezone/needs_cleanup"));
+}
+
 TEST_F(stage_test, numbers_a_release_one_above_its_highest_staged_set) {
   make_device("2025b");
   tree::make_dir("/var/db/timezone/tz/2026a.1.4");
@@ -181,15 +195,16 @@ const refusal kRefusals[] = {
      "release 2026a is not newer than 2026a.1.0 of the system partition"},
     {"system partition newer", [] { make_device("2026b"); }, the_set,
      "not newer than 2026b.1.0 of the system partition"},
-    {"links designate a set of the same release",
+    {"links designate a set of a newer release",
      [] {
        make_device("2025b");
-       tree::make_dir("/var/db/timezone/tz/2026a.1.1/icutz");
+       tree::make_dir("/var/db/timezone/tz/2026b.1.1/icutz");
        (void)unlink("/var/db/timezone/zoneinfo");
-       tree::make_link("/var/db/timezone/tz/2026a.1.1/zoneinfo",
+       tree::make_link("/var/db/timezone/tz/2026b.1.1/zoneinfo",
                        "/var/db/timezone/zoneinfo");
      },
-     the_set, "not newer than 2026a.1.1, the set the links designate"},
+     the_set,
+     "release 2026a is older than 2026b.1.1, the set the links designate"},
     {"another ICU schema", [] { make_device("2025b", "72l"); }, the_set,
      "its ICU schema \"44l\" is not the system partition's \"72l\""},
     {"another staging running",
