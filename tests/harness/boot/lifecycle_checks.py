@@ -18,14 +18,15 @@ TOKYO = ["JST+0900", "JST+0900"]
 
 
 def zone_names(zoneinfo):
-    """Every zone and link name of ZONEINFO/tzdata.zi."""
+    """Every zone and link name of ZONEINFO/tzdata.zi, whether its lines are
+    in zic's short form ("Z", "L") or written out ("Zone", "Link")."""
     names = set()
     with open(os.path.join(zoneinfo, "tzdata.zi")) as source:
         for line in source:
             fields = line.split()
-            if fields[:1] == ["Z"]:
+            if fields[:1] in (["Z"], ["Zone"]):
                 names.add(fields[1])
-            elif fields[:1] == ["L"]:
+            elif fields[:1] in (["L"], ["Link"]):
                 names.add(fields[2])
     return sorted(names)
 
